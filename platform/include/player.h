@@ -1,0 +1,64 @@
+/// \file
+/// Native player interface.
+///
+/// Every function returns 0 (`PLAYER_ERROR_NONE`) or one of the error codes below, and logs its
+/// failures. Positions and lengths are in milliseconds. A player may be used by several threads;
+/// its functions run one after the other, except `player_destroy`, which must be the last.
+#pragma once
+
+#ifdef __cplusplus
+extern "C" {
+#else
+#include <stdbool.h>
+#endif
+
+/// A player's handle.
+typedef struct player_s* player_h;
+
+enum player_error_e {
+  PLAYER_ERROR_NONE = 0,
+  PLAYER_ERROR_IO = -5,                    ///< The file can't be read, or the framework failed.
+  PLAYER_ERROR_NO_SUCH_FILE = -2,          ///< There is no such file.
+  PLAYER_ERROR_OUT_OF_MEMORY = -12,        ///< Memory could not be allocated.
+  PLAYER_ERROR_INVALID_PARAMETER = -22,    ///< An argument is rejected.
+  PLAYER_ERROR_INVALID_OPERATION = -38,    ///< The media can't do that.
+  PLAYER_ERROR_INVALID_STATE = -26476510,  ///< No file is open (0xFE6C0022).
+};
+
+/// Creates a player. \param player receives the handle, to be given to `player_destroy`
+int player_create(player_h* player);
+
+/// Closes the file and frees the player.
+int player_destroy(player_h player);
+
+/// Opens a file, replacing the open one, and pauses on its first frame. After a failure no file is
+/// open.
+int player_open(player_h player, const char* path);
+
+/// Closes the file. Succeeds when none is open.
+int player_close(player_h player);
+
+int player_play(player_h player);
+int player_pause(player_h player);
+
+/// Moves to \p position, or (\p exact false) to a key frame at or before it, and returns when the
+/// new position is known.
+int player_seek(player_h player, long position, bool exact);
+
+int player_get_position(player_h player, long* position);
+int player_get_duration(player_h player, long* duration);
+
+/// \param key_frame receives whether the last seek showed a key frame
+int player_is_key_frame(player_h player, bool* key_frame);
+
+/// Receives a picture: rows of three bytes a pixel (red, green, blue), \p stride bytes apart, valid
+/// during the call.
+typedef void (*player_frame_cb)(const unsigned char* pixels, int width, int height, int stride,
+                                void* user_data);
+
+/// Hands the frame at the current position to \p callback, on the calling thread.
+int player_capture_frame(player_h player, player_frame_cb callback, void* user_data);
+
+#ifdef __cplusplus
+}
+#endif

@@ -1,0 +1,112 @@
+#include "PlayerError.h"
+
+#include <Host/Calls.h>
+#include <Tizen/Base/Log.h>
+#include <Tizen/Media/Player.h>
+#include <Tizen/Media/PlayerImpl.h>
+
+#include <cstring>
+#include <memory>
+#include <new>
+#include <utility>
+
+namespace Tizen::Media {
+namespace {
+
+/// Reports a failure found before the native player was asked.
+result Fail(result r, const char* reason, int line = __builtin_LINE()) {
+  SysLogExceptionInternal(Host::kPlayerModule, r, "", line, "[%s] %s", GetErrorMessage(r), reason);
+  return r;
+}
+
+/// Runs a native function, which logs its own failures, on the player behind \p pImpl.
+template <typename... Parameters, typename... Arguments>
+result Call(_PlayerImpl* pImpl, int (*function)(player_h, Parameters...), Arguments... arguments) {
+  if (pImpl == nullptr) return Fail(E_INVALID_STATE, "the player is not constructed");
+  return Host::ConvertPlayerErrorToResult(function(pImpl->__hPlayer, arguments...));
+}
+
+}  // namespace
+
+_PlayerImpl* _PlayerImpl::GetInstance(Player* pPlayer) {
+  Host::OnCall("_PlayerImpl::GetInstance", "%s", "");
+  return pPlayer == nullptr ? nullptr : pPlayer->__pPlayerImpl;
+}
+
+_PlayerImpl::~_PlayerImpl() {
+  if (__hPlayer != nullptr) player_destroy(__hPlayer);
+}
+
+result _PlayerImpl::Construct() {
+  return Host::ConvertPlayerErrorToResult(player_create(&__hPlayer));
+}
+
+result _PlayerImpl::SeekTo(long msTime, bool exact) {
+  if (auto failure =
+          Host::OnCall("_PlayerImpl::SeekTo", "%ld, %s", msTime, exact ? "true" : "false")) {
+    return static_cast<result>(*failure);
+  }
+  return Call(this, player_seek, msTime, exact);
+}
+
+Player::~Player() { delete __pPlayerImpl; }
+
+result Player::Construct() {
+  if (__pPlayerImpl != nullptr) return Fail(E_INVALID_STATE, "the player is constructed already");
+  std::unique_ptr<_PlayerImpl> pImpl(new (std::nothrow) _PlayerImpl);
+  if (pImpl == nullptr) return Fail(E_OUT_OF_MEMORY, "no memory for a player");
+  const result r = pImpl->Construct();
+  if (r == E_SUCCESS) __pPlayerImpl = pImpl.release();
+  return r;
+}
+
+result Player::OpenFile(const char* path) { return Call(__pPlayerImpl, player_open, path); }
+
+result Player::Close() { return Call(__pPlayerImpl, player_close); }
+
+result Player::Play() { return Call(__pPlayerImpl, player_play); }
+
+result Player::Pause() { return Call(__pPlayerImpl, player_pause); }
+
+long Player::GetPosition() const {
+  long position = -1;
+  return Call(__pPlayerImpl, player_get_position, &position) == E_SUCCESS ? position : -1;
+}
+
+long Player::GetDuration() const {
+  long duration = -1;
+  return Call(__pPlayerImpl, player_get_duration, &duration) == E_SUCCESS ? duration : -1;
+}
+
+bool Player::IsKeyFrame() const {
+  bool keyFrame = false;
+  return Call(__pPlayerImpl, player_is_key_frame, &keyFrame) == E_SUCCESS && keyFrame;
+}
+
+result Player::CaptureFrame(VideoFrame& frame) const {
+  VideoFrame captured;
+  const auto copy = [](const unsigned char* pixels, int width, int height, int stride,
+                       void* userData) {
+    auto& target = *static_cast<VideoFrame*>(userData);
+    const std::size_t rowSize = static_cast<std::size_t>(width) * 3;
+    try {
+      target.pixels.resize(rowSize * static_cast<std::size_t>(height));
+    } catch (const std::bad_alloc&) {
+      return;
+    }
+    target.width = width;
+    target.height = height;
+    for (int row = 0; row < height; ++row) {
+      std::memcpy(target.pixels.data() + rowSize * static_cast<std::size_t>(row),
+                  pixels + static_cast<std::ptrdiff_t>(stride) * row, rowSize);
+    }
+  };
+  const result r = Call(__pPlayerImpl, player_capture_frame, player_frame_cb(copy),
+                        static_cast<void*>(&captured));
+  if (r != E_SUCCESS) return r;
+  if (captured.width == 0) return Fail(E_OUT_OF_MEMORY, "no memory for a frame");
+  frame = std::move(captured);
+  return E_SUCCESS;
+}
+
+}  // namespace Tizen::Media

@@ -1,0 +1,21 @@
+#include "PlayerError.h"
+
+#include <Tizen/Base/Log.h>
+
+#include <cstdarg>
+#include <cstdio>
+
+namespace Host {
+
+int PlayerFailure(int error, int line, const char* format, ...) noexcept {
+  char reason[512];
+  va_list arguments;
+  va_start(arguments, format);
+  std::vsnprintf(reason, sizeof reason, format, arguments);
+  va_end(arguments);
+  const result r = ConvertPlayerErrorToResult(error);
+  SysLogExceptionInternal(kPlayerModule, r, "", line, "[%s] %s", GetErrorMessage(r), reason);
+  return error;
+}
+
+}  // namespace Host

@@ -1,0 +1,30 @@
+/// \file
+/// Error codes of the native player interface, as results and in the log. For both devices.
+#pragma once
+
+#include <Tizen/Base/Result.h>
+#include <player.h>
+
+namespace Host {
+
+/// The player's module number in the log.
+inline constexpr int kPlayerModule = 60;
+
+inline result ConvertPlayerErrorToResult(int error) {
+  switch (error) {
+    case PLAYER_ERROR_NONE: return E_SUCCESS;
+    case PLAYER_ERROR_NO_SUCH_FILE: return E_OBJ_NOT_FOUND;
+    case PLAYER_ERROR_OUT_OF_MEMORY: return E_OUT_OF_MEMORY;
+    case PLAYER_ERROR_INVALID_PARAMETER: return E_INVALID_ARG;
+    case PLAYER_ERROR_INVALID_OPERATION: return E_INVALID_OPERATION;
+    case PLAYER_ERROR_INVALID_STATE: return E_INVALID_STATE;
+    default: return E_SYSTEM;
+  }
+}
+
+/// Logs why a player's function fails and gives back \p error, so that a failure is one statement.
+/// The message is put behind the code's name: "[E_INVALID_STATE] no file is open".
+int PlayerFailure(int error, int line, const char* format, ...) noexcept
+    __attribute__((format(printf, 3, 4)));
+
+}  // namespace Host

@@ -1,0 +1,61 @@
+/// \file
+/// How this library reports a failure: one statement records the result, logs once with the place
+/// of the caller and gives the result back.
+///
+/// The managers and everything beneath them use the platform family, whose exception log leaves the
+/// result in the last result; the classes that an application makes itself use the application
+/// family, which sets it beforehand.
+#pragma once
+
+#include <Tizen/Base/Log.h>
+#include <Tizen/Base/Result.h>
+
+namespace Zelkora::Media {
+
+inline constexpr int kLogModule = 80;
+inline constexpr char kLogTag[] = "ZELKORA_MEDIA";
+
+/// The platform family names no function.
+inline constexpr char kNoFunction[] = "";
+
+/// A format text together with the line it stands on.
+struct Format {
+  Format(const char* format, int callerLine = __builtin_LINE()) : text(format), line(callerLine) {}
+
+  const char* text;
+  int line;
+};
+
+/// The same for the application family, whose lines also carry the signature of the function.
+struct Place {
+  Place(const char* signature, int callerLine = __builtin_LINE())
+      : function(signature), line(callerLine) {}
+
+  const char* function;
+  int line;
+};
+
+/// Reports a failure through the platform family, which makes \p r the last result.
+/// \return r
+template <typename... Arguments>
+result Fail(result r, Format format, Arguments... arguments) {
+  SysLogExceptionInternal(kLogModule, r, kNoFunction, format.line, format.text, arguments...);
+  return r;
+}
+
+/// Reports a failure of a step that was called, through the platform family.
+inline result Propagate(result r, int line = __builtin_LINE()) {
+  return Fail(r, {"[%s] Propagating.", line}, GetErrorMessage(r));
+}
+
+/// Reports a failure through the application family and makes \p r the last result.
+/// \param place the function's signature: `__PRETTY_FUNCTION__`
+/// \return r
+template <typename... Arguments>
+result FailTagged(result r, Place place, const char* format, Arguments... arguments) {
+  SetLastResult(r);
+  AppLogExceptionTagInternal(kLogTag, place.function, place.line, format, arguments...);
+  return r;
+}
+
+}  // namespace Zelkora::Media

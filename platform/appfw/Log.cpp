@@ -166,6 +166,7 @@ void SysLogExceptionInternal(int module, result r, const char* function, int lin
 void SysTryReturnResultInternal(int module, result r, const char* function, int line,
                                 const char* format, ...) noexcept {
   DELIVER_FORMATTED(PlatformFailure(module, r, function, line));
+  SetLastResult(r);
 }
 
 void SysLogInternal(int module, const char* function, int line, const char* format, ...) noexcept {

@@ -6,7 +6,7 @@
 ///
 ///     if (!APP_ASSERT(__pImpl != null, kAppNotYetConstructed)) return E_INVALID_STATE;
 ///
-/// Macros, because the report holds the condition's text and the function's signature.
+/// A macro, because the report holds the condition's text and the function's signature.
 #pragma once
 
 #include <Tizen/Base/Log.h>
@@ -27,6 +27,3 @@ inline constexpr char kSysNotYetConstructed[] =
 
 #define APP_ASSERT(condition, message) \
   ((condition) || (AppassertfInternal(#condition, __PRETTY_FUNCTION__, __LINE__, message), false))
-
-#define SYS_ASSERT(condition, message) \
-  ((condition) || (SysAssertfInternal(#condition, "", __LINE__, message), false))

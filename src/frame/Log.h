@@ -48,6 +48,12 @@ inline result Propagate(result r, int line = __builtin_LINE()) {
   return Fail(r, {"[%s] Propagating.", line}, GetErrorMessage(r));
 }
 
+/// Writes a line without a result through the platform family.
+template <typename... Arguments>
+void LogDiagnostic(Format format, Arguments... arguments) {
+  SysLogInternal(kLogModule, kNoFunction, format.line, format.text, arguments...);
+}
+
 /// Reports a failure through the application family and makes \p r the last result.
 /// \param place the function's signature: `__PRETTY_FUNCTION__`
 /// \return r

@@ -20,16 +20,17 @@ std::string Logged(void (*log)()) {
   return testing::internal::GetCapturedStderr();
 }
 
-TEST(LastResult, IsEachThreadsOwnAndRecordedByThePlatformsExceptionLogOnly) {
+TEST(LastResult, IsEachThreadsOwnAndRecordedByTheFailuresOfThePlatformFamilyOnly) {
   SetLastResult(E_SYSTEM);
   std::thread([] { EXPECT_EQ(GetLastResult(), E_SUCCESS); }).join();
   testing::internal::CaptureStderr();
-  SysTryReturnResultInternal(80, E_INVALID_ARG, "", 1, "a");
   SysLogInternal(80, "", 1, "b");
   AppLogExceptionTagInternal("T", "f", 1, "c");
   EXPECT_EQ(GetLastResult(), E_SYSTEM);
   SysLogExceptionInternal(80, E_INVALID_ARG, "", 1, "d");
   EXPECT_EQ(GetLastResult(), E_INVALID_ARG);
+  SysTryReturnResultInternal(80, E_INVALID_STATE, "", 1, "a");
+  EXPECT_EQ(GetLastResult(), E_INVALID_STATE);
   testing::internal::GetCapturedStderr();
   ClearLastResult();
   EXPECT_EQ(GetLastResult(), E_SUCCESS);

@@ -18,7 +18,8 @@
 void SysLogExceptionInternal(int module, result r, const char* function, int line,
                              const char* format, ...) noexcept TIZEN_PRINTF(5, 6);
 
-/// A failed check whose result the caller returns. Doesn't touch the last result.
+/// A failed check whose result the caller returns. The host platform makes it the last result too;
+/// nothing relies on that.
 void SysTryReturnResultInternal(int module, result r, const char* function, int line,
                                 const char* format, ...) noexcept TIZEN_PRINTF(5, 6);
 

@@ -1,0 +1,44 @@
+#include "AudioSessionManagerImpl.h"
+#include "frame/Capabilities.h"
+#include "frame/Guard.h"
+#include "frame/ManagerLife.h"
+
+namespace Zelkora::Media {
+
+using Impl = _AudioSessionManagerImpl;
+
+std::atomic<AudioSessionManager*> AudioSessionManager::__pInstance{nullptr};
+pthread_once_t AudioSessionManager::__onceBlock = PTHREAD_ONCE_INIT;
+
+AudioSessionManager* AudioSessionManager::GetInstance() {
+  return _ManagerLife::GetInstance<AudioSessionManager>(kAudioSessionPrivilege,
+                                                        __PRETTY_FUNCTION__);
+}
+
+void AudioSessionManager::InitSingleton() {
+  _ManagerLife::InitSingleton<AudioSessionManager>(kObjectNotCreated);
+}
+
+void AudioSessionManager::DestroySingleton() {
+  _ManagerLife::DestroySingleton<AudioSessionManager>();
+}
+
+AudioSessionManager::AudioSessionManager() : __pImpl(nullptr) {}
+
+AudioSessionManager::~AudioSessionManager() { delete __pImpl; }
+
+result AudioSessionManager::Construct() { return _ManagerLife::Construct(*this); }
+
+result AudioSessionManager::SetAudioSessionEventListener(IAudioSessionEventListener* pListener) {
+  return Forward(__pImpl, kAudioSessionPrivilege, &Impl::SetAudioSessionEventListener, pListener);
+}
+
+result AudioSessionManager::SetMode(AudioSessionMode mode) {
+  return Forward(__pImpl, kAudioSessionPrivilege, &Impl::SetMode, mode);
+}
+
+AudioSessionMode AudioSessionManager::GetMode() const {
+  return Forward(__pImpl, kAudioSessionPrivilege, &Impl::GetMode);
+}
+
+}  // namespace Zelkora::Media

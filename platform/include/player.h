@@ -59,6 +59,41 @@ typedef void (*player_frame_cb)(const unsigned char* pixels, int width, int heig
 /// Hands the frame at the current position to \p callback, on the calling thread.
 int player_capture_frame(player_h player, player_frame_cb callback, void* user_data);
 
+/// Writes the open file's sound, effects included, to \p path, a WAV file of 16-bit stereo samples,
+/// faster than in real time, and returns when that is done. The player itself stays as it is.
+int player_render_audio(player_h player, const char* path);
+
+/// \name Sound effects
+/// They belong to the player, not to a file, and stay as they are when another is opened. A level
+/// outside its range and a value that isn't supported are refused with -22.
+/// @{
+
+typedef int audio_effect_e;         ///< 1 bass, 2 treble, 3 reverb, 4 stereo width, 5 dynamics
+typedef int audio_effect_preset_e;  ///< 0 to 19; 1 is the neutral one
+
+/// Called once for each value, on the calling thread. \return true to go on, false to stop
+typedef bool (*player_audio_effect_supported_effect_cb)(audio_effect_e effect, void* user_data);
+typedef bool (*player_audio_effect_supported_preset_cb)(audio_effect_preset_e preset,
+                                                        void* user_data);
+
+int player_audio_effect_foreach_supported_effect(player_h player,
+                                                 player_audio_effect_supported_effect_cb callback,
+                                                 void* user_data);
+int player_audio_effect_foreach_supported_preset(player_h player,
+                                                 player_audio_effect_supported_preset_cb callback,
+                                                 void* user_data);
+
+int player_audio_effect_set_value(player_h player, audio_effect_e effect, int value);
+int player_audio_effect_get_value(player_h player, audio_effect_e effect, int* value);
+int player_audio_effect_get_value_range(player_h player, audio_effect_e effect, int* min, int* max);
+
+/// Puts an effect back to its default.
+int player_audio_effect_clear(player_h player, audio_effect_e effect);
+
+/// Selects a preset, which stays selected until another is.
+int player_audio_effect_set_preset(player_h player, audio_effect_preset_e preset);
+/// @}
+
 #ifdef __cplusplus
 }
 #endif

@@ -109,4 +109,8 @@ result Player::CaptureFrame(VideoFrame& frame) const {
   return E_SUCCESS;
 }
 
+result Player::RenderAudio(const char* path) const {
+  return Call(__pPlayerImpl, player_render_audio, path);
+}
+
 }  // namespace Tizen::Media

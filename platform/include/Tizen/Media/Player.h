@@ -71,6 +71,15 @@ class Player : public Tizen::Base::Object {
   /// file has no video; `E_OUT_OF_MEMORY`; `E_SYSTEM`
   result CaptureFrame(VideoFrame& frame) const;
 
+  /// Writes the sound of the open file, as it would be heard with the effects that are set, to a WAV
+  /// file of 16-bit stereo samples, faster than in real time. Position and playing go on as they were.
+  /// Unlike other operations it takes as long as the file needs.
+  /// \param path the file to write; one that exists is replaced, and a failure leaves none
+  /// \return `E_SUCCESS`; `E_INVALID_ARG` for a null or empty path; `E_INVALID_STATE` when no file is
+  /// open; `E_INVALID_OPERATION` when the file has no sound, or the device renders none; `E_SYSTEM`
+  /// when the file can't be written or the media framework fails
+  result RenderAudio(const char* path) const;
+
  private:
   friend class _PlayerImpl;
 

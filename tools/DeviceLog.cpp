@@ -1,0 +1,72 @@
+#include "DeviceLog.h"
+
+#include <Host/Log.h>
+
+#include <cstdio>
+#include <cstring>
+#include <mutex>
+
+namespace CommandLine::DeviceLog {
+namespace {
+
+constexpr int kLibraryModule = 80;  // its lines only pass the device's failures on
+
+std::mutex mutex;  // guards the two below: a device logs on its own threads too
+result lastCode = E_SUCCESS;
+char lastMessage[1024];  // of fixed size because a sink must not throw
+
+void Remember(const Host::LogRecord& record) {
+  std::lock_guard lock(mutex);
+  lastCode = record.code;
+  std::snprintf(lastMessage, sizeof lastMessage, "%s", record.message);
+}
+
+void Write(const Host::LogRecord& record) {
+  static constexpr const char* kLevels[] = {"info", "error", "assertion"};
+  std::fprintf(stderr, "zelkora %s", kLevels[static_cast<int>(record.level)]);
+  if (record.module != 0) std::fprintf(stderr, " module=%d", record.module);
+  if (record.tag[0] != '\0') std::fprintf(stderr, " tag=%s", record.tag);
+  if (record.hasResult) std::fprintf(stderr, " result=%s", GetErrorMessage(record.code));
+  if (record.function[0] != '\0') std::fprintf(stderr, " function=\"%s\"", record.function);
+  std::fprintf(stderr, " line=%d: %s\n", record.line, record.message);
+}
+
+void WriteLine(const Host::LogRecord& record) {
+  flockfile(stderr);  // threads' lines don't mix
+  Write(record);
+  funlockfile(stderr);
+}
+
+bool IsFromDevice(const Host::LogRecord& record) {
+  return record.hasResult && record.module != 0 && record.module != kLibraryModule;
+}
+
+void Receive(const Host::LogRecord& record, void* verbose) {
+  if (IsFromDevice(record)) Remember(record);
+  if (verbose != nullptr || record.level == Host::LogLevel::kAssertion) WriteLine(record);
+}
+
+/// \return \p text behind the first \p end when it begins with \p begin.
+const char* Skip(const char* text, char begin, const char* end) {
+  const char* found = text[0] == begin ? std::strstr(text, end) : nullptr;
+  return found == nullptr ? text : found + std::strlen(end);
+}
+
+/// "[E_SYSTEM] "a.mp4": no such file" -> "no such file": the rest is told anyway.
+const char* ReasonIn(const char* message) { return Skip(Skip(message, '[', "] "), '"', "\": "); }
+
+}  // namespace
+
+void Install(bool verbose) {
+  static bool on = true;
+  Host::SetLogSink(Receive, verbose ? &on : nullptr);
+}
+
+std::string TakeReason(result r) {
+  std::lock_guard lock(mutex);
+  std::string reason = lastCode == r ? ReasonIn(lastMessage) : "";
+  lastMessage[0] = '\0';
+  return reason;
+}
+
+}  // namespace CommandLine::DeviceLog

@@ -1,0 +1,17 @@
+#pragma once
+
+#include <Tizen/Base/Result.h>
+
+#include <string>
+
+/// The platform's log, held back: a command tells the reason of a failure itself.
+namespace CommandLine::DeviceLog {
+
+/// Puts the log in the program's hands, for the rest of its life.
+/// \param verbose whether every line is also written to standard error
+void Install(bool verbose);
+
+/// \return why the device failed with \p r last, or "" when it gave no reason; forgets it.
+std::string TakeReason(result r);
+
+}  // namespace CommandLine::DeviceLog

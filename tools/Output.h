@@ -1,0 +1,18 @@
+#pragma once
+
+#include <string_view>
+
+/// Standard output.
+namespace CommandLine {
+
+/// Ends a command without a word: nobody reads its output any more.
+struct OutputIsClosed {};
+
+/// Writes a text at once. Throws `OutputIsClosed`, or a `Failure` when the device is full or fails.
+void Print(std::string_view text);
+
+/// To be called first. Keeps the numbers of closed standard streams from files that are opened
+/// later, which would else receive what is printed.
+void ReserveStandardStreams();
+
+}  // namespace CommandLine

@@ -3,10 +3,11 @@
 #include <Tizen/Security/AccessController.h>
 #include <Tizen/System/SystemInfo.h>
 
+#include <algorithm>
 #include <array>
 #include <atomic>
-#include <cstring>
 #include <cwchar>
+#include <string_view>
 
 namespace {
 
@@ -16,12 +17,12 @@ using Tizen::Base::String;
 /// program may change them while another thread asks.
 template <std::size_t N>
 struct Answers {
-  const char* const (&names)[N];
+  const std::string_view (&names)[N];
   std::array<std::atomic<result>, N> answers{};
 
-  std::atomic<result>* Find(const char* name) {
+  std::atomic<result>* Find(std::string_view name) {
     for (std::size_t i = 0; i < N; ++i) {
-      if (std::strcmp(names[i], name) == 0) return &answers[i];
+      if (names[i] == name) return &answers[i];
     }
     return nullptr;
   }
@@ -32,13 +33,14 @@ struct Answers {
     if (std::wcsncmp(key, L"http://", kSchemeLength) != 0) return E_OBJ_NOT_FOUND;
     const wchar_t* path = std::wcschr(key + kSchemeLength, L'/');
     if (path == nullptr || std::wcsncmp(path, prefix, prefixLength) != 0) return E_OBJ_NOT_FOUND;
+    const std::wstring_view name(path + prefixLength);
     for (std::size_t i = 0; i < N; ++i) {
-      if (IsSameText(path + prefixLength, names[i])) return answers[i].load();
+      if (IsSameText(name, names[i])) return answers[i].load();
     }
     return E_OBJ_NOT_FOUND;
   }
 
-  bool Set(const char* name, result answer) {
+  bool Set(std::string_view name, result answer) {
     std::atomic<result>* entry = Find(name);
     if (entry == nullptr) return false;
     *entry = answer;
@@ -50,9 +52,8 @@ struct Answers {
   }
 
  private:
-  static bool IsSameText(const wchar_t* wide, const char* narrow) {
-    while (*narrow != '\0' && *wide == static_cast<wchar_t>(*narrow)) ++wide, ++narrow;
-    return *narrow == '\0' && *wide == L'\0';
+  static bool IsSameText(std::wstring_view wide, std::string_view narrow) {
+    return wide.size() == narrow.size() && std::equal(narrow.begin(), narrow.end(), wide.begin());
   }
 };
 
@@ -66,9 +67,9 @@ Answers<std::size(Host::kPrivileges)> privileges{Host::kPrivileges};
 
 namespace Host {
 
-bool SetFeature(const char* name, result answer) noexcept { return features.Set(name, answer); }
+bool SetFeature(std::string_view name, result answer) noexcept { return features.Set(name, answer); }
 
-bool SetPrivilege(const char* name, result answer) noexcept { return privileges.Set(name, answer); }
+bool SetPrivilege(std::string_view name, result answer) noexcept { return privileges.Set(name, answer); }
 
 void ResetCapabilities() noexcept {
   features.Reset();

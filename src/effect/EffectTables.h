@@ -3,10 +3,12 @@
 /// `E_INVALID_ARG` and writes nothing; it doesn't report.
 #pragma once
 
+#include <Tizen/Base/Result.h>
 #include <Zelkora/Media/AudioEffector.h>
 #include <player.h>
 
 #include <array>
+#include <cstddef>
 
 namespace Zelkora::Media {
 
@@ -16,8 +18,11 @@ struct EffectRow {
   Platform platformValue;
 };
 
+using EffectTypeRow = EffectRow<AudioEffectType, audio_effect_e>;
+using PresetRow = EffectRow<AudioEffectPreset, audio_effect_preset_e>;
+
 /// In the order in which effects are put back.
-inline constexpr std::array<EffectRow<AudioEffectType, audio_effect_e>, 5> kEffects{{
+inline constexpr std::array<EffectTypeRow, 5> kEffects{{
     {AUDIO_EFFECT_BASS, audio_effect_e(1)},
     {AUDIO_EFFECT_TREBLE, audio_effect_e(2)},
     {AUDIO_EFFECT_REVERB, audio_effect_e(3)},
@@ -27,7 +32,7 @@ inline constexpr std::array<EffectRow<AudioEffectType, audio_effect_e>, 5> kEffe
 
 inline constexpr audio_effect_preset_e kNeutralPlatformPreset = audio_effect_preset_e(1);
 
-inline constexpr std::array<EffectRow<AudioEffectPreset, audio_effect_preset_e>, 20> kPresets{{
+inline constexpr std::array<PresetRow, 20> kPresets{{
     {AUDIO_EFFECT_PRESET_NORMAL, kNeutralPlatformPreset},
     {AUDIO_EFFECT_PRESET_POP, audio_effect_preset_e(0)},
     {AUDIO_EFFECT_PRESET_ROCK, audio_effect_preset_e(2)},
@@ -50,14 +55,67 @@ inline constexpr std::array<EffectRow<AudioEffectPreset, audio_effect_preset_e>,
     {AUDIO_EFFECT_PRESET_SMALL_SPEAKERS, audio_effect_preset_e(19)},
 }};
 
-result ConvertToPlatformEffect(AudioEffectType type, audio_effect_e& effect) noexcept;
-result ConvertFromPlatformEffect(audio_effect_e effect, AudioEffectType& type) noexcept;
-result ConvertToPlatformPreset(AudioEffectPreset preset,
-                               audio_effect_preset_e& platformPreset) noexcept;
-result ConvertFromPlatformPreset(audio_effect_preset_e platformPreset,
-                                 AudioEffectPreset& preset) noexcept;
+template <typename Table, typename Field>
+constexpr std::size_t HighestValue(const Table& table, Field field) {
+  std::size_t highest = 0;
+  for (const auto& row : table) {
+    if (static_cast<std::size_t>(row.*field) > highest)
+      highest = static_cast<std::size_t>(row.*field);
+  }
+  return highest;
+}
+
+/// \return the table's rows, each where the value of its field says; null where there is none.
+template <std::size_t N, typename Table, typename Field>
+constexpr auto IndexRows(const Table& table, Field field) {
+  std::array<const typename Table::value_type*, N> rows{};
+  for (const auto& row : table) rows[static_cast<std::size_t>(row.*field)] = &row;
+  return rows;
+}
+
+/// Finds the row of \p table whose field \p from holds \p value and writes its field \p to.
+template <auto& table, auto from, auto to, typename From, typename To>
+result LookUp(From value, To& found) noexcept {
+  constexpr std::size_t kEnd = 1 + HighestValue(table, from);
+  static constexpr auto rows = IndexRows<kEnd>(table, from);
+  const auto index = static_cast<unsigned>(value);
+  if (index >= kEnd || rows[index] == nullptr) return E_INVALID_ARG;
+  found = rows[index]->*to;
+  return E_SUCCESS;
+}
+
+inline result ConvertToPlatformEffect(AudioEffectType type, audio_effect_e& effect) noexcept {
+  return LookUp<kEffects, &EffectTypeRow::publicValue, &EffectTypeRow::platformValue>(type, effect);
+}
+
+inline result ConvertFromPlatformEffect(audio_effect_e effect, AudioEffectType& type) noexcept {
+  return LookUp<kEffects, &EffectTypeRow::platformValue, &EffectTypeRow::publicValue>(effect, type);
+}
+
+inline result ConvertToPlatformPreset(AudioEffectPreset preset,
+                                      audio_effect_preset_e& platformPreset) noexcept {
+  return LookUp<kPresets, &PresetRow::publicValue, &PresetRow::platformValue>(preset,
+                                                                              platformPreset);
+}
+
+inline result ConvertFromPlatformPreset(audio_effect_preset_e platformPreset,
+                                        AudioEffectPreset& preset) noexcept {
+  return LookUp<kPresets, &PresetRow::platformValue, &PresetRow::publicValue>(platformPreset,
+                                                                              preset);
+}
 
 /// \return the result that a return code of the player's effect functions stands for.
-result ConvertPlayerError(int error) noexcept;
+constexpr result ConvertPlayerError(int error) noexcept {
+  constexpr int kInvalidPlayerState = -26476510;
+  static_assert(static_cast<unsigned>(kInvalidPlayerState) == 0xFE6C0022);
+  if (error == 0) return E_SUCCESS;  // apart, because it is nearly always that
+  switch (error) {
+    case -22: return E_INVALID_ARG;
+    case -12: return E_OUT_OF_MEMORY;
+    case -38: return E_INVALID_OPERATION;
+    case kInvalidPlayerState: return E_INVALID_STATE;
+    default: return E_SYSTEM;
+  }
+}
 
 }  // namespace Zelkora::Media

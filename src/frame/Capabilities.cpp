@@ -23,13 +23,15 @@ result CheckFeature(const wchar_t* key, Place place) {
   return FailTagged(r, place, "[%s] Propagating.", GetErrorMessage(r));
 }
 
-result CheckPrivilege(const wchar_t* key, int line) {
-  if (Tizen::Security::AccessController::CheckPrivilege(String(key)) == E_SUCCESS) {
-    return E_SUCCESS;
-  }
-  return Fail(E_PRIVILEGE_DENIED, {"[E_PRIVILEGE_DENIED] This application does not have the "
-                                   "privilege to call this method.",
-                                   line});
+bool HasPrivilege(const wchar_t* key) {
+  return Tizen::Security::AccessController::CheckPrivilege(String(key)) == E_SUCCESS;
+}
+
+result FailPrivilege(int line) {
+  return Fail(E_PRIVILEGE_DENIED,
+              {"[E_PRIVILEGE_DENIED] This application does not have the privilege to call this "
+               "method.",
+               line});
 }
 
 }  // namespace Zelkora::Media

@@ -31,9 +31,17 @@ inline constexpr wchar_t kAudioVolumePrivilege[] =
 /// when the feature is absent or unknown, else the lookup's own failure
 result CheckFeature(const wchar_t* key, Place place);
 
+/// \return whether the application holds a privilege.
+bool HasPrivilege(const wchar_t* key);
+
+/// Reports that it doesn't. \return `E_PRIVILEGE_DENIED`
+result FailPrivilege(int line);
+
 /// Privilege gate: asks the platform whether the application holds a privilege.
 /// \return `E_SUCCESS`, or `E_PRIVILEGE_DENIED`, then logged and the last result, whatever the
 /// platform answered
-result CheckPrivilege(const wchar_t* key, int line = __builtin_LINE());
+inline result CheckPrivilege(const wchar_t* key, int line = __builtin_LINE()) {
+  return HasPrivilege(key) ? E_SUCCESS : FailPrivilege(line);
+}
 
 }  // namespace Zelkora::Media

@@ -1,6 +1,8 @@
 /// \file
 #pragma once
 
+#include "Capabilities.h"
+
 #include <Tizen/Base/Result.h>
 
 #include <type_traits>
@@ -16,10 +18,16 @@ struct Privilege {
   int line;
 };
 
+/// Reports that a manager isn't constructed. \return `E_INVALID_STATE`, where that returns
+result AssertNotConstructed(int line);
+
 /// The guard before every operation of a manager: construction assertion, then privilege gate.
 /// \param pImpl the manager's implementation object, null when it isn't constructed
 /// \return `E_SUCCESS`, or `E_INVALID_STATE` or `E_PRIVILEGE_DENIED`, reported already
-result Guard(const void* pImpl, Privilege privilege);
+inline result Guard(const void* pImpl, Privilege privilege) {
+  if (pImpl == nullptr) return AssertNotConstructed(privilege.line);
+  return CheckPrivilege(privilege.key, privilege.line);
+}
 
 /// \return what an operation that is refused with \p r returns: \p r, or -1 in place of a value.
 template <typename Value>

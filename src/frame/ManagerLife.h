@@ -7,6 +7,7 @@
 
 #include <pthread.h>
 
+#include <atomic>
 #include <cstdlib>
 #include <new>
 #include <type_traits>

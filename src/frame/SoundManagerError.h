@@ -6,6 +6,14 @@
 namespace Zelkora::Media {
 
 /// \return the result that an error code of the native sound manager stands for.
-result ConvertSoundManagerError(int error) noexcept;
+constexpr result ConvertSoundManagerError(int error) noexcept {
+  if (error == 0) return E_SUCCESS;  // apart, because it is nearly always that
+  switch (error) {
+    case -12: return E_OUT_OF_MEMORY;
+    case -22: return E_INVALID_ARG;
+    case -38: return E_INVALID_OPERATION;
+    default: return E_SYSTEM;
+  }
+}
 
 }  // namespace Zelkora::Media

@@ -7,51 +7,46 @@
 #include <Zelkora/Media/IAudioSessionEventListener.h>
 #include <sound_manager.h>
 
+#include <array>
 #include <new>
 
 namespace Zelkora::Media {
 namespace {
 
-struct ModeRow {
-  AudioSessionMode mode;
-  int sessionType;
-};
-
-/// The modes that their session type alone decides. All others, also unknown ones, have session
-/// type 0, where the media-session option decides.
-constexpr ModeRow kModes[] = {
-    {AUDIO_SESSION_MODE_EMERGENCY, 3},
-    {AUDIO_SESSION_MODE_NOTIFICATION, 2},
-    {AUDIO_SESSION_MODE_ALARM, 1},
-};
+/// The session type of each mode. Where it is `kMediaSessionType`, the media-session option
+/// decides.
 constexpr int kMediaSessionType = 0;
+constexpr std::array kSessionTypes = {kMediaSessionType, kMediaSessionType, 3, 2, 1};
+static_assert(kSessionTypes.size() == AUDIO_SESSION_MODE_ALARM + 1);
 
 /// The media-session option pair of `AUDIO_SESSION_MODE_MEDIA_MIX`.
 constexpr int kMixFirst = 1;
 constexpr int kMixSecond = 0;
 
 int ToSessionType(AudioSessionMode mode) {
-  for (const ModeRow& row : kModes) {
-    if (row.mode == mode) return row.sessionType;
-  }
-  return kMediaSessionType;
+  const auto row = static_cast<unsigned>(mode);
+  return row < kSessionTypes.size() ? kSessionTypes[row] : kMediaSessionType;
 }
 
 /// \return the mode, or `AUDIO_SESSION_MODE_MEDIA` when the option decides.
 AudioSessionMode ToMode(int sessionType) {
-  for (const ModeRow& row : kModes) {
-    if (row.sessionType == sessionType) return row.mode;
+  for (int mode = AUDIO_SESSION_MODE_EMERGENCY; mode <= AUDIO_SESSION_MODE_ALARM; ++mode) {
+    if (kSessionTypes[static_cast<unsigned>(mode)] == sessionType) {
+      return static_cast<AudioSessionMode>(mode);
+    }
   }
   return AUDIO_SESSION_MODE_MEDIA;
 }
 
-/// Converts the answer to a setting, logging a failure with the raw code.
-result Check(int error, const char* failure, int line = __builtin_LINE()) {
+result FailSetting(int error, const char* failure, int line) {
   const result r = ConvertSoundManagerError(error);
-  if (r != E_SUCCESS) {
-    SysTryReturnResultInternal(kLogModule, r, kNoFunction, line, failure, error);
-  }
+  SysTryReturnResultInternal(kLogModule, r, kNoFunction, line, failure, error);
   return r;
+}
+
+/// Converts the answer to a setting, logging a failure with the raw code.
+inline result Check(int error, const char* failure, int line = __builtin_LINE()) {
+  return error == 0 ? E_SUCCESS : FailSetting(error, failure, line);
 }
 
 }  // namespace

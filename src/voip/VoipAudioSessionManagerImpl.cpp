@@ -3,30 +3,28 @@
 #include "frame/Log.h"
 #include "frame/SoundManagerError.h"
 
-#include <iterator>
+#include <array>
 
 namespace Zelkora::Media {
 namespace {
 
 constexpr int kVoipCall = 1;
 
-/// The mode for each platform mode.
-constexpr VoipAudioSessionMode kModes[] = {
-    VOIP_AUDIO_SESSION_MODE_VOICE,
-    VOIP_AUDIO_SESSION_MODE_RINGTONE,
-    VOIP_AUDIO_SESSION_MODE_MEDIA,
-};
+/// The platform mode of each mode.
+constexpr std::array kPlatformModes = {0, 0, 1, 2};
+static_assert(kPlatformModes.size() == VOIP_AUDIO_SESSION_MODE_MEDIA + 1);
 
-int ToPlatformMode(VoipAudioSessionMode mode) {
-  for (std::size_t i = 0; i < std::size(kModes); ++i) {
-    if (kModes[i] == mode) return static_cast<int>(i);
-  }
-  return 0;
+bool IsKnown(VoipAudioSessionMode mode) {
+  return static_cast<unsigned>(mode) < kPlatformModes.size();
 }
 
 VoipAudioSessionMode FromPlatformMode(int platformMode) {
-  const auto row = static_cast<unsigned>(platformMode);
-  return row < std::size(kModes) ? kModes[row] : VOIP_AUDIO_SESSION_MODE_NONE;
+  for (int mode = VOIP_AUDIO_SESSION_MODE_VOICE; mode <= VOIP_AUDIO_SESSION_MODE_MEDIA; ++mode) {
+    if (kPlatformModes[static_cast<unsigned>(mode)] == platformMode) {
+      return static_cast<VoipAudioSessionMode>(mode);
+    }
+  }
+  return VOIP_AUDIO_SESSION_MODE_NONE;
 }
 
 result FailNotEntered(int line = __builtin_LINE()) {
@@ -94,12 +92,12 @@ result _VoipAudioSessionManagerImpl::ExitCallSession() {
 
 result _VoipAudioSessionManagerImpl::SetCallSessionMode(VoipAudioSessionMode mode) {
   if (__soundCallSessionHandle == nullptr) return FailNotEntered();
-  if (static_cast<unsigned>(mode) > VOIP_AUDIO_SESSION_MODE_MEDIA) {
+  if (!IsKnown(mode)) {
     return Fail(E_INVALID_ARG,
                 " [E_INVALID_ARG] Invalid argument is used. The mode is not correct : %d", mode);
   }
   const result r = ConvertSoundManagerError(
-      sound_manager_call_session_set_mode(__soundCallSessionHandle, ToPlatformMode(mode)));
+      sound_manager_call_session_set_mode(__soundCallSessionHandle, kPlatformModes[mode]));
   if (r != E_SUCCESS) {
     return Fail(r, "[%s] Failed to perform sound_manager_call_session_set_mode operation.",
                 GetErrorMessage(r));

@@ -14,10 +14,14 @@
 namespace Zelkora::Media {
 namespace {
 
-/// Converts a sound manager's answer, logging a failure under the name of its function.
-result Convert(int error, Format failure) {
+result FailSoundManager(int error, Format failure) {
   const result r = ConvertSoundManagerError(error);
-  return r == E_SUCCESS ? r : Fail(r, failure, GetErrorMessage(r), error);
+  return Fail(r, failure, GetErrorMessage(r), error);
+}
+
+/// Converts a sound manager's answer, logging a failure under the name of its function.
+inline result Convert(int error, Format failure) {
+  return error == 0 ? E_SUCCESS : FailSoundManager(error, failure);
 }
 
 result SetMuteAll(bool muteAll) {

@@ -6,14 +6,16 @@
 
 #include <Tizen/Base/Result.h>
 
+#include <string_view>
+
 namespace Host {
 
 /// The features known to the platform, by the last element of their keys' paths.
-inline constexpr const char* kFeatures[] = {"audio_effector", "audio_manager",
+inline constexpr std::string_view kFeatures[] = {"audio_effector", "audio_manager",
                                             "zelkora_extension_2.2"};
 
 /// The privileges known to the platform, by the last element of their keys' paths.
-inline constexpr const char* kPrivileges[] = {"audiomanager.session", "audiomanager.voipsession",
+inline constexpr std::string_view kPrivileges[] = {"audiomanager.session", "audiomanager.voipsession",
                                               "audiomanager.volume"};
 
 /// Answer to the lookup of a feature that the device doesn't offer; with `E_SUCCESS` it does, and
@@ -23,11 +25,11 @@ inline constexpr result kFeatureAbsent = 1;
 /// Sets what the lookup of a feature answers: `E_SUCCESS`, `kFeatureAbsent`, `E_OBJ_NOT_FOUND` for
 /// a feature that isn't known, or any other code. \return false, with nothing done, for a name not
 /// in `kFeatures`
-bool SetFeature(const char* name, result answer) noexcept;
+bool SetFeature(std::string_view name, result answer) noexcept;
 
 /// Sets what the check of a privilege answers; `E_SUCCESS` grants it.
 /// \return false, with nothing done, for a name not in `kPrivileges`
-bool SetPrivilege(const char* name, result answer) noexcept;
+bool SetPrivilege(std::string_view name, result answer) noexcept;
 
 /// Makes every feature present and grants every privilege.
 void ResetCapabilities() noexcept;

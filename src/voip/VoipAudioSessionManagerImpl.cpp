@@ -96,8 +96,8 @@ result _VoipAudioSessionManagerImpl::SetCallSessionMode(VoipAudioSessionMode mod
     return Fail(E_INVALID_ARG,
                 " [E_INVALID_ARG] Invalid argument is used. The mode is not correct : %d", mode);
   }
-  const result r = ConvertSoundManagerError(
-      sound_manager_call_session_set_mode(__soundCallSessionHandle, kPlatformModes[mode]));
+  const result r = ConvertSoundManagerError(sound_manager_call_session_set_mode(
+      __soundCallSessionHandle, kPlatformModes[static_cast<unsigned>(mode)]));
   if (r != E_SUCCESS) {
     return Fail(r, "[%s] Failed to perform sound_manager_call_session_set_mode operation.",
                 GetErrorMessage(r));

@@ -67,9 +67,13 @@ Answers<std::size(Host::kPrivileges)> privileges{Host::kPrivileges};
 
 namespace Host {
 
-bool SetFeature(std::string_view name, result answer) noexcept { return features.Set(name, answer); }
+bool SetFeature(std::string_view name, result answer) noexcept {
+  return features.Set(name, answer);
+}
 
-bool SetPrivilege(std::string_view name, result answer) noexcept { return privileges.Set(name, answer); }
+bool SetPrivilege(std::string_view name, result answer) noexcept {
+  return privileges.Set(name, answer);
+}
 
 void ResetCapabilities() noexcept {
   features.Reset();

@@ -19,11 +19,18 @@ result Fail(result r, const char* reason, int line = __builtin_LINE()) {
   return r;
 }
 
+/// \return the result of a native function, which has logged its failure, as the last result too.
+result Report(int error) {
+  const result r = Host::ConvertPlayerErrorToResult(error);
+  if (r != E_SUCCESS) SetLastResult(r);
+  return r;
+}
+
 /// Runs a native function, which logs its own failures, on the player behind \p pImpl.
 template <typename... Parameters, typename... Arguments>
 result Call(_PlayerImpl* pImpl, int (*function)(player_h, Parameters...), Arguments... arguments) {
   if (pImpl == nullptr) return Fail(E_INVALID_STATE, "the player is not constructed");
-  return Host::ConvertPlayerErrorToResult(function(pImpl->__hPlayer, arguments...));
+  return Report(function(pImpl->__hPlayer, arguments...));
 }
 
 }  // namespace
@@ -38,7 +45,7 @@ _PlayerImpl::~_PlayerImpl() {
 }
 
 result _PlayerImpl::Construct() {
-  return Host::ConvertPlayerErrorToResult(player_create(&__hPlayer));
+  return Report(player_create(&__hPlayer));
 }
 
 result _PlayerImpl::SeekTo(long msTime, bool exact) {

@@ -14,7 +14,9 @@ int PlayerFailure(int error, int line, const char* format, ...) noexcept {
   std::vsnprintf(reason, sizeof reason, format, arguments);
   va_end(arguments);
   const result r = ConvertPlayerErrorToResult(error);
+  const result before = GetLastResult();
   SysLogExceptionInternal(kPlayerModule, r, "", line, "[%s] %s", GetErrorMessage(r), reason);
+  SetLastResult(before);
   return error;
 }
 

@@ -7,6 +7,7 @@
 #include <Zelkora/Media/AudioEffector.h>
 #include <player.h>
 
+#include <algorithm>
 #include <array>
 #include <cstddef>
 
@@ -58,18 +59,19 @@ inline constexpr std::array<PresetRow, 20> kPresets{{
 template <typename Table, typename Field>
 constexpr std::size_t HighestValue(const Table& table, Field field) {
   std::size_t highest = 0;
-  for (const auto& row : table) {
-    if (static_cast<std::size_t>(row.*field) > highest)
-      highest = static_cast<std::size_t>(row.*field);
-  }
+  for (const auto& row : table) highest = std::max(highest, static_cast<std::size_t>(row.*field));
   return highest;
 }
 
-/// \return the table's rows, each where the value of its field says; null where there is none.
+/// \return the table's rows, each where the value of its field says; null where there is none. No value
+/// may come twice.
 template <std::size_t N, typename Table, typename Field>
 constexpr auto IndexRows(const Table& table, Field field) {
   std::array<const typename Table::value_type*, N> rows{};
-  for (const auto& row : table) rows[static_cast<std::size_t>(row.*field)] = &row;
+  for (const auto& row : table) {
+    auto& place = rows[static_cast<std::size_t>(row.*field)];
+    place = place == nullptr ? &row : throw "a value comes twice";  // an error when compiled
+  }
   return rows;
 }
 

@@ -94,21 +94,19 @@ class ZELKORA_MEDIA_API AudioEffector : public Tizen::Base::Object {
   /// \param player a constructed player; a file need not be open yet
   /// \return what is then also the last result, on success too, except where assertions return:
   /// - `E_SUCCESS`
-  /// - `E_UNSUPPORTED_OPERATION` when the device lacks the feature, or the player supports no
-  /// effect and
-  ///   no preset; a list that the player fails to give counts as empty
+  /// - `E_UNSUPPORTED_OPERATION` when the device lacks the feature, or the player supports no effect
+  ///   and no preset; a list that can't be had counts as empty
   /// - another code of the feature's lookup when that fails, unchanged
   /// - `E_OUT_OF_MEMORY` for want of memory, and when the player was never constructed
   /// - `E_INVALID_STATE` when the player has no native handle; and, with the last result untouched,
-  /// when
-  ///   the effector is constructed already; both where assertions return
+  ///   when the effector is constructed already; both where assertions return
   result Construct(Tizen::Media::Player& player);
 
   /// \return a new list of the effects that the player supports, in the player's order, possibly
   /// empty; the caller deletes it. Null on failure, with the last result `E_OUT_OF_MEMORY` or the
   /// player's refusal. Success leaves the last result as it was, unless the player reports an
   /// effect that isn't known here: that is left out, logged, and makes the last result
-  /// `E_INVALID_ARG`.
+  /// `E_INVALID_ARG`. An entry for which memory is short is left out and logged, no more.
   Tizen::Base::Collection::IListT<AudioEffectType>* GetSupportedEffectListN() const;
 
   /// The same for presets.
@@ -123,8 +121,9 @@ class ZELKORA_MEDIA_API AudioEffector : public Tizen::Base::Object {
 
   /// Reads an effect's level.
   /// \param type the effect
-  /// \param level receives the level; untouched for an unknown effect, and after the player's
-  /// refusal what the player left in it \return as of `SetEffectLevel`
+  /// \param level receives the level; untouched for an unknown effect, and after the player's refusal
+  /// what the player left in it
+  /// \return as of `SetEffectLevel`
   result GetEffectLevel(AudioEffectType type, int& level) const;
 
   /// Reads the range of an effect's level.
@@ -135,10 +134,10 @@ class ZELKORA_MEDIA_API AudioEffector : public Tizen::Base::Object {
   result GetEffectLevelRange(AudioEffectType type, int& minValue, int& maxValue) const;
 
   /// Puts every effect back to its default, then selects `AUDIO_EFFECT_PRESET_NORMAL`. The first
-  /// step that fails ends it; what was put back before stays so. \return `E_SUCCESS`;
-  /// `E_INVALID_ARG`, then also the last result, when an effect can't be put back, whatever the
-  /// player's reason; the player's refusal when the preset can't be selected, which isn't logged,
-  /// with `E_SUCCESS` as the last result
+  /// step that fails ends it; what was put back before stays so.
+  /// \return `E_SUCCESS`; `E_INVALID_ARG`, then also the last result, when an effect can't be put
+  /// back, whatever the player's reason; the player's refusal when the preset can't be selected,
+  /// which isn't logged, with `E_SUCCESS` as the last result
   result ResetAllToDefault();
 
   /// Selects a preset.

@@ -62,11 +62,11 @@ class ZELKORA_MEDIA_API AudioSessionManager : public Tizen::Base::Object {
 
   /// Names the one listener that hears of interruptions, in place of the one before.
   ///
-  /// \param pListener the listener, or null for none; it stays the application's and must live
-  /// until another, or null, takes its place. On the host platform no call of the listener before
-  /// is running when this returns, unless it is called from inside one. \return `E_SUCCESS`;
-  /// `E_PRIVILEGE_DENIED`; the platform's code when the listener before can't be removed, which
-  /// then stays, or when the new one can't be added, after which there is none
+  /// \param pListener the listener, or null for none; it stays the application's and must live until
+  /// another, or null, takes its place. On the host platform no call of the listener before is
+  /// running when this returns, unless it is called from inside one.
+  /// \return `E_SUCCESS`; `E_PRIVILEGE_DENIED`; the platform's code when the listener before can't be
+  /// removed, which then stays, or when the new one can't be added, after which there is none
   result SetAudioSessionEventListener(IAudioSessionEventListener* pListener);
 
   /// Sets the mode. Every value is accepted: one outside the enumeration sends session type 0. The

@@ -12,18 +12,19 @@ namespace Host {
 
 /// The features known to the platform, by the last element of their keys' paths.
 inline constexpr std::string_view kFeatures[] = {"audio_effector", "audio_manager",
-                                            "zelkora_extension_2.2"};
+                                                 "zelkora_extension_2.2"};
 
 /// The privileges known to the platform, by the last element of their keys' paths.
-inline constexpr std::string_view kPrivileges[] = {"audiomanager.session", "audiomanager.voipsession",
-                                              "audiomanager.volume"};
+inline constexpr std::string_view kPrivileges[] = {
+    "audiomanager.session", "audiomanager.voipsession", "audiomanager.volume"};
 
 /// Answer to the lookup of a feature that the device doesn't offer; with `E_SUCCESS` it does, and
 /// with any other code the lookup fails.
 inline constexpr result kFeatureAbsent = 1;
 
 /// Sets what the lookup of a feature answers: `E_SUCCESS`, `kFeatureAbsent`, `E_OBJ_NOT_FOUND` for
-/// a feature that isn't known, or any other code. \return false, with nothing done, for a name not
+/// a feature that isn't known, or any other code.
+/// \return false, with nothing done, for a name not
 /// in `kFeatures`
 bool SetFeature(std::string_view name, result answer) noexcept;
 

@@ -10,46 +10,54 @@
 namespace Tizen::Base::Runtime {
 
 /// An event that tells its listeners later, on the process's one dispatcher thread, in the order of
-/// firing.
+/// firing over all events.
 ///
-/// All operations may be called on any thread, also from inside a listener's call. An exception
-/// that leaves a listener is logged and ends there.
+/// All operations but construction, `Initialize` and destruction may be called on any thread at any
+/// time, also from inside a listener's call. An exception that leaves a listener is logged and ends
+/// there. At process exit the dispatcher stops once the call that is running has returned, and
+/// frees what is still queued; events may live on.
 class _Event : public Tizen::Base::Object {
  public:
   _Event();
 
-  /// Drops what is still queued and waits for a listener's call that is running, unless it is
-  /// called from inside one.
+  /// Drops and frees what is still queued, and waits for a listener's call that is running and for
+  /// its argument to be freed. From inside a listener's call of this very event it doesn't wait:
+  /// the other listeners then hear nothing more and the argument is freed when the call returns.
   ~_Event() override;
 
-  /// Makes the event ready; until then every other operation fails with `E_INVALID_STATE`.
-  /// \return `E_SUCCESS`, `E_OUT_OF_MEMORY`, or `E_SYSTEM` when the dispatcher can't be started
+  /// Makes the event ready; until then every other operation fails with `E_INVALID_STATE`. The type
+  /// that the object has now is the one whose `FireToListener` is called.
+  /// \return `E_SUCCESS`; `E_INVALID_OPERATION` when it is ready already; `E_OUT_OF_MEMORY`;
+  /// `E_SYSTEM` when the dispatcher can't be started
   result Initialize();
 
-  /// Adds a listener, which hears what is fired from now on and must live until it is removed.
+  /// Adds a listener, which hears what is fired from now on, not what is queued already, and must
+  /// live until it is removed.
   /// \param listener the listener, which isn't owned
-  /// \param once true: it hears one event only and is removed then
+  /// \param once true: it hears one event only and is removed before that call
   /// \return `E_SUCCESS`; `E_INVALID_OPERATION` when it is added already; `E_OUT_OF_MEMORY`
   result AddListener(const IEventListener& listener, bool once);
 
-  /// Removes a listener. No call of it is running when this returns, unless it is called from
-  /// inside that call, and none follows. \return `E_SUCCESS`, `E_OBJ_NOT_FOUND` when it isn't added
+  /// Removes a listener, which hears nothing more, not even what is queued. No call of it is
+  /// running when this returns, unless this is called from inside a listener's call.
+  /// \return `E_SUCCESS`, `E_OBJ_NOT_FOUND` when it isn't added
   result RemoveListener(const IEventListener& listener);
 
   /// Queues \p arg, which was made with `new` and belongs to the platform from now on: it is freed
-  /// after the last delivery, or at once when this fails.
-  /// \return `E_SUCCESS`, or another code when nothing was queued
+  /// after the last delivery, or at once when this fails. Allocates nothing.
+  /// \return `E_SUCCESS`, or another code when nothing was queued; `E_SYSTEM` when the process is
+  /// ending
   result FireAsync(IEventArg& arg);
 
  protected:
-  /// Tells one listener; called for every listener of every argument.
+  /// Tells one listener; called for every listener of every argument, in the order of adding.
   virtual void FireToListener(IEventListener& listener, const IEventArg& arg) = 0;
 
  private:
   friend class _Dispatcher;
   class _Listeners;
 
-  std::unique_ptr<_Listeners> __pListeners;
+  std::unique_ptr<_Listeners> __pListeners;  // null until the event is ready
 };
 
 }  // namespace Tizen::Base::Runtime

@@ -1,6 +1,8 @@
 /// \file
 #pragma once
 
+#include <cstdint>
+
 namespace Tizen::Base::Runtime {
 
 class _Event;
@@ -16,6 +18,7 @@ class __attribute__((visibility("default"))) IEventArg {
   friend class _Dispatcher;
   IEventArg* __pNext = nullptr;
   _Event* __pEvent = nullptr;
+  std::uint64_t __number = 0;  // in the order of firing, over all events
 };
 
 }  // namespace Tizen::Base::Runtime

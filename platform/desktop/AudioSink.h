@@ -1,0 +1,12 @@
+/// \file
+#pragma once
+
+#include "Gst.h"
+
+namespace Desktop {
+
+/// \return where a player's sound goes: to the sound server, or, when none answers at once,
+/// nowhere, in real time. Null when not even that can be made.
+ElementPtr MakeAudioSink();
+
+}  // namespace Desktop

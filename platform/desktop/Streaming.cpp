@@ -1,0 +1,34 @@
+#include "Streaming.h"
+
+namespace Desktop {
+namespace {
+
+using IteratorPtr = std::unique_ptr<GstIterator, FreeWith<gst_iterator_free>>;
+
+/// Finds what isn't changed meanwhile only; a pipeline that changes is looked at once more.
+bool HasAny(GstIterator* iterator, GCompareFunc isOther) {
+  GValue found = G_VALUE_INIT;
+  const bool hasFound = gst_iterator_find_custom(iterator, isOther, &found, nullptr);
+  if (hasFound) g_value_unset(&found);
+  return hasFound;
+}
+
+int IsIdlePad(gconstpointer value, gconstpointer) {
+  auto* pad = GST_PAD(g_value_get_object(static_cast<const GValue*>(value)));
+  return gst_pad_get_task_state(pad) == GST_TASK_STARTED ? 0 : 1;
+}
+
+int IsIdleElement(gconstpointer value, gconstpointer) {
+  auto* element = GST_ELEMENT(g_value_get_object(static_cast<const GValue*>(value)));
+  const IteratorPtr pads(gst_element_iterate_pads(element));
+  return HasAny(pads.get(), IsIdlePad) ? 0 : 1;
+}
+
+}  // namespace
+
+bool IsStreaming(GstElement* pipeline) {
+  const IteratorPtr elements(gst_bin_iterate_recurse(GST_BIN(pipeline)));
+  return HasAny(elements.get(), IsIdleElement);
+}
+
+}  // namespace Desktop

@@ -1,0 +1,52 @@
+/// \file
+#pragma once
+
+#include <cstddef>
+
+namespace Desktop {
+
+/// The last stage of the effects: stereo width, dynamics, gain and a limiter, on interleaved stereo
+/// samples, in place. Changes are spread over some milliseconds, so that none is heard as a click.
+/// When it has nothing to do, the samples stay as they are, bit by bit.
+class Finish {
+ public:
+  /// As they are, nothing changes.
+  struct Parameters {
+    float gain = 1;         ///< a factor
+    float sideGain = 1;     ///< a factor of the difference between left and right
+    float compression = 0;  ///< how much of a change of level, in dB, is taken away
+  };
+
+  /// To be called before the first samples.
+  void SetRate(int samplesPerSecond);
+
+  /// \param mayBeLouder the stages in front change the sound, so that the limiter has to watch it
+  void MoveTo(const Parameters& target, bool mayBeLouder);
+
+  /// Goes there at once, because a new sound begins.
+  void BeginAt(const Parameters& target, bool mayBeLouder);
+
+  /// \return whether `Process` would change nothing
+  bool IsResting() const { return isResting_; }
+
+  void Process(float* samples, std::size_t frames);
+
+ private:
+  void Glide();
+  void Settle();
+  float Compress(float peak);
+  float Limit(float peak);
+
+  Parameters target_;
+  Parameters now_;
+  bool mayBeLouder_ = false;
+  float envelope_ = 0;   // the sound's level as the dynamics see it
+  float reduction_ = 1;  // the limiter's gain
+  bool isResting_ = true;
+  // Shares of the way that are gone in one frame.
+  float glide_ = 1;
+  float attack_ = 1;
+  float release_ = 1;
+};
+
+}  // namespace Desktop

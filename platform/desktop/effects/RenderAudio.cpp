@@ -1,0 +1,168 @@
+#include "RenderAudio.h"
+
+#include "../../media/PlayerError.h"
+#include "../Gst.h"
+#include "../PipelineWatch.h"
+#include "Chain.h"
+
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <atomic>
+#include <cerrno>
+#include <chrono>
+#include <cstdio>
+#include <cstring>
+#include <string>
+
+namespace Desktop {
+namespace {
+
+using Answer = PipelineWatch::Answer;
+using Host::PlayerFailure;
+
+/// Longer than a decoder pauses, on a slow device too.
+constexpr std::chrono::seconds kStandstillLimit{10};
+
+/// A file beside the one to be written, so that nobody sees that half done.
+class TemporaryFile {
+ public:
+  explicit TemporaryFile(const std::string& path) : path_(path) {
+    static std::atomic<unsigned> count{0};
+    name_ = path + "." + std::to_string(getpid()) + "-" + std::to_string(++count) + ".part";
+  }
+  ~TemporaryFile() { std::remove(name_.c_str()); }
+
+  TemporaryFile(const TemporaryFile&) = delete;
+  TemporaryFile& operator=(const TemporaryFile&) = delete;
+
+  const char* GetName() const { return name_.c_str(); }
+
+  /// Gives it its final name.
+  int Keep() const {
+    if (std::rename(name_.c_str(), path_.c_str()) == 0) return PLAYER_ERROR_NONE;
+    return PlayerFailure(PLAYER_ERROR_IO, __LINE__, "\"%s\" can't be written: %s", path_.c_str(),
+                         std::strerror(errno));
+  }
+
+ private:
+  const std::string path_;
+  std::string name_;
+};
+
+/// A pipeline from a file to a file: decoder, effects, 16-bit stereo, WAV.
+class Rendering {
+ public:
+  explicit Rendering(const EffectSettings& settings) : settings_(settings), effects_(settings_) {}
+  ~Rendering() {
+    // Ends the streaming threads, which use the chain and the watch.
+    if (pipeline_ != nullptr) gst_element_set_state(pipeline_.get(), GST_STATE_NULL);
+  }
+
+  Rendering(const Rendering&) = delete;
+  Rendering& operator=(const Rendering&) = delete;
+
+  int Build(const char* uri, const char* path);
+  int Run();
+
+ private:
+  bool Append(GstElement* element);
+  static void OnDecoded(GstElement*, GstPad* sound, gpointer rendering);
+  int Await(GstState state);
+  gint64 GetBytesWritten() const;
+
+  const SharedSettings settings_;
+  const EffectChain effects_;
+  ElementPtr pipeline_;
+  std::unique_ptr<PipelineWatch> watch_;
+  GstElement* last_ = nullptr;  // the pipeline's
+};
+
+int Rendering::Build(const char* uri, const char* path) {
+  pipeline_.reset(GST_ELEMENT(gst_object_ref_sink(gst_pipeline_new(nullptr))));
+  watch_ = std::make_unique<PipelineWatch>(pipeline_.get());
+  const ElementPtr source = MakeElement("uridecodebin");
+  const ElementPtr converter = MakeElement("audioconvert");
+  const ElementPtr format = MakeElement("capsfilter");
+  const ElementPtr encoder = MakeElement("wavenc");
+  const ElementPtr sink = MakeElement("filesink");
+  bool isComplete = source != nullptr && gst_bin_add(GST_BIN(pipeline_.get()), source.get());
+  for (GstElement* element :
+       {effects_.GetElement(), converter.get(), format.get(), encoder.get(), sink.get()}) {
+    isComplete = isComplete && Append(element);
+  }
+  if (!isComplete) {
+    return PlayerFailure(PLAYER_ERROR_IO, __LINE__,
+                         "GStreamer's base or good plug-ins are missing");
+  }
+  const CapsPtr sound(gst_caps_new_empty_simple("audio/x-raw"));
+  const CapsPtr samples(gst_caps_new_simple("audio/x-raw", "format", G_TYPE_STRING, "S16LE",
+                                            "channels", G_TYPE_INT, 2, nullptr));
+  g_object_set(source.get(), "uri", uri, "caps", sound.get(), "expose-all-streams", FALSE, nullptr);
+  g_signal_connect(source.get(), "pad-added", G_CALLBACK(OnDecoded), effects_.GetElement());
+  // Sound that isn't changed comes out as it was, without noise added.
+  g_object_set(converter.get(), "dithering", 0, nullptr);
+  g_object_set(format.get(), "caps", samples.get(), nullptr);
+  g_object_set(sink.get(), "location", path, nullptr);
+  return PLAYER_ERROR_NONE;
+}
+
+/// Links \p element, if there is one, behind the last one.
+bool Rendering::Append(GstElement* element) {
+  if (element == nullptr || !gst_bin_add(GST_BIN(pipeline_.get()), element)) return false;
+  if (last_ != nullptr && !gst_element_link(last_, element)) return false;
+  last_ = element;
+  return true;
+}
+
+/// Of several sounds the first is taken.
+void Rendering::OnDecoded(GstElement*, GstPad* sound, gpointer effects) {
+  const PadPtr input(gst_element_get_static_pad(static_cast<GstElement*>(effects), "sink"));
+  if (!gst_pad_is_linked(input.get())) gst_pad_link(sound, input.get());
+}
+
+/// Prerolls first, so that what is answered after that is the end.
+int Rendering::Run() {
+  if (const int error = Await(GST_STATE_PAUSED)) return error;
+  return Await(GST_STATE_PLAYING);
+}
+
+int Rendering::Await(GstState state) {
+  watch_->ExpectAnswer();
+  gst_element_set_state(pipeline_.get(), state);
+  Answer answer = Answer::kNone;
+  gint64 written = 0;
+  do {
+    written = GetBytesWritten();
+    answer = watch_->WaitForAnswer(kStandstillLimit);
+  } while (answer == Answer::kNone && GetBytesWritten() != written);
+  if (answer == Answer::kDone) return PLAYER_ERROR_NONE;
+  const std::string reason = watch_->GetFailure().reason;
+  return PlayerFailure(PLAYER_ERROR_IO, __LINE__, "the sound can't be written: %s",
+                       reason.empty() ? "GStreamer stands still" : reason.c_str());
+}
+
+gint64 Rendering::GetBytesWritten() const {
+  gint64 bytes = 0;
+  gst_element_query_position(last_, GST_FORMAT_BYTES, &bytes);
+  return bytes;
+}
+
+}  // namespace
+
+int RenderAudio(const char* uri, const EffectSettings& settings, const char* path) {
+  struct stat status;
+  // What isn't a plain file, as a device, would be replaced by one.
+  if (stat(path, &status) == 0 && !S_ISREG(status.st_mode)) {
+    return PlayerFailure(PLAYER_ERROR_IO, __LINE__, "\"%s\" is not a plain file", path);
+  }
+  const TemporaryFile file(path);
+  {
+    Rendering rendering(settings);
+    if (const int error = rendering.Build(uri, file.GetName())) return error;
+    if (const int error = rendering.Run()) return error;
+  }
+  return file.Keep();
+}
+
+}  // namespace Desktop

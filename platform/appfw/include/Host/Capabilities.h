@@ -24,8 +24,7 @@ inline constexpr result kFeatureAbsent = 1;
 
 /// Sets what the lookup of a feature answers: `E_SUCCESS`, `kFeatureAbsent`, `E_OBJ_NOT_FOUND` for
 /// a feature that isn't known, or any other code.
-/// \return false, with nothing done, for a name not
-/// in `kFeatures`
+/// \return false, with nothing done, for a name not in `kFeatures`
 bool SetFeature(std::string_view name, result answer) noexcept;
 
 /// Sets what the check of a privilege answers; `E_SUCCESS` grants it.

@@ -1,5 +1,7 @@
 #include "Allocations.h"
 
+#include <atomic>
+#include <cstdint>
 #include <cstdlib>
 #include <new>
 
@@ -9,13 +11,34 @@ thread_local std::size_t count = 0;
 thread_local std::size_t untilFailure = 0;  // 0: none fails
 thread_local bool failed = false;
 
+constexpr std::size_t kNone = 0;
+constexpr std::size_t kAll = SIZE_MAX;
+std::atomic<std::size_t> untilLibraryFailure{kNone};  // the library's are those that don't throw
+std::atomic<std::ptrdiff_t> live{0};
+
 void* Allocate(std::size_t size) {
   ++count;
   if (untilFailure > 0 && --untilFailure == 0) {
     failed = true;
     return nullptr;
   }
+  live.fetch_add(1, std::memory_order_relaxed);
   return std::malloc(size);
+}
+
+bool IsLibraryToFail() {
+  std::size_t left = untilLibraryFailure;
+  while (left != kNone && left != kAll) {
+    if (untilLibraryFailure.compare_exchange_weak(left, left - 1)) return left == 1;
+  }
+  return left == kAll;
+}
+
+void* AllocateOrNull(std::size_t size) { return IsLibraryToFail() ? nullptr : Allocate(size); }
+
+void Free(void* memory) {
+  if (memory != nullptr) live.fetch_sub(1, std::memory_order_relaxed);
+  std::free(memory);
 }
 
 void* AllocateOrThrow(std::size_t size) {
@@ -28,14 +51,20 @@ void* AllocateOrThrow(std::size_t size) {
 
 void* operator new(std::size_t size) { return AllocateOrThrow(size); }
 void* operator new[](std::size_t size) { return AllocateOrThrow(size); }
-void* operator new(std::size_t size, const std::nothrow_t&) noexcept { return Allocate(size); }
-void* operator new[](std::size_t size, const std::nothrow_t&) noexcept { return Allocate(size); }
-void operator delete(void* memory) noexcept { std::free(memory); }
-void operator delete[](void* memory) noexcept { std::free(memory); }
-void operator delete(void* memory, std::size_t) noexcept { std::free(memory); }
-void operator delete[](void* memory, std::size_t) noexcept { std::free(memory); }
+void* operator new(std::size_t size, const std::nothrow_t&) noexcept {
+  return AllocateOrNull(size);
+}
+void* operator new[](std::size_t size, const std::nothrow_t&) noexcept {
+  return AllocateOrNull(size);
+}
+void operator delete(void* memory) noexcept { Free(memory); }
+void operator delete[](void* memory) noexcept { Free(memory); }
+void operator delete(void* memory, std::size_t) noexcept { Free(memory); }
+void operator delete[](void* memory, std::size_t) noexcept { Free(memory); }
 
 std::size_t CountAllocations() { return count; }
+
+std::ptrdiff_t CountLiveAllocations() { return live; }
 
 FailingAllocation::FailingAllocation(std::size_t nth) {
   untilFailure = nth;
@@ -45,3 +74,9 @@ FailingAllocation::FailingAllocation(std::size_t nth) {
 FailingAllocation::~FailingAllocation() { untilFailure = 0; }
 
 bool FailingAllocation::HasFailed() const { return failed; }
+
+FailingLibraryAllocation::FailingLibraryAllocation(std::size_t nth) {
+  untilLibraryFailure = nth == 0 ? kAll : nth;
+}
+
+FailingLibraryAllocation::~FailingLibraryAllocation() { untilLibraryFailure = kNone; }

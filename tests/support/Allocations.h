@@ -1,5 +1,5 @@
 /// \file
-/// Counts the calling thread's allocations and makes one of them fail. Linking this replaces the
+/// Counts allocations and makes some of them fail. Linking this replaces the
 /// program's `operator new`.
 #pragma once
 
@@ -7,6 +7,9 @@
 
 /// \return how many allocations the calling thread has made with `new`.
 std::size_t CountAllocations();
+
+/// \return how many allocations of the whole program haven't been freed.
+std::ptrdiff_t CountLiveAllocations();
 
 /// Makes an allocation of the calling thread fail while it lives.
 class FailingAllocation {
@@ -17,4 +20,13 @@ class FailingAllocation {
 
   /// \return whether it has come to the failure.
   bool HasFailed() const;
+};
+
+/// Makes one of the library's own allocations fail while it lives, or all of them, on any thread.
+/// The library alone allocates without throwing.
+class FailingLibraryAllocation {
+ public:
+  /// \param nth which allocation from now on, the next being 1; 0 for every one
+  explicit FailingLibraryAllocation(std::size_t nth = 0);
+  ~FailingLibraryAllocation();
 };

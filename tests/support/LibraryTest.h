@@ -17,7 +17,10 @@ class LibraryTest : public testing::Test {
     Host::SetAssertionAction(Host::AssertionAction::kReturn);
     ClearLastResult();
   }
-  ~LibraryTest() override { Simulated::Reset(); }
+  ~LibraryTest() override {
+    Simulated::WaitUntilDelivered();  // lest the next test hears it
+    Simulated::Reset();
+  }
 
   LogCapture log;
 };

@@ -1,0 +1,300 @@
+// The life of the managers, from the first GetInstance to the end of the process. Each test has a
+// process of its own, made by one that never has a manager.
+
+#include "support/Allocations.h"
+#include "support/LibraryTest.h"
+#include "support/Managers.h"
+#include "support/OwnProcess.h"
+
+#include <Zelkora/Media/IAudioSessionEventListener.h>
+
+#include <algorithm>
+#include <array>
+#include <atomic>
+#include <functional>
+#include <future>
+#include <optional>
+#include <thread>
+
+namespace {
+
+using testing::ElementsAre;
+using testing::IsEmpty;
+using namespace Zelkora::Media;
+using Lines = std::vector<std::string>;
+
+Lines operator+(Lines head, const Lines& tail) {
+  head.insert(head.end(), tail.begin(), tail.end());
+  return head;
+}
+
+std::string Propagating(result r) { return SysNamed(r, " Propagating."); }
+
+std::string NoMemory(const char* tail) {
+  return SysNamed(E_OUT_OF_MEMORY, std::string(" Memory allocation failed.") + tail);
+}
+
+/// The calls that end a manager's callbacks, in their order.
+template <typename Manager>
+Lines Unset() {
+  Lines calls;
+  for (const std::string& callback : Facts<Manager>::Callbacks()) {
+    calls.push_back("sound_manager_unset_" + callback + "_cb()");
+  }
+  return calls;
+}
+
+/// One way for a manager's creation to fail, and what it leaves in the log.
+struct Failure {
+  std::size_t allocation;  ///< which of the library's allocations fails; 0: none
+  std::string function;    ///< or else which function of the platform does
+  int code;
+  result expected;
+  std::string cause;
+  std::size_t propagations;  ///< how many layers pass it on
+  Lines calls;               ///< behind the gates
+};
+
+template <typename Manager>
+std::vector<Failure> Failures() {
+  using Known = Facts<Manager>;
+  constexpr char kNotCreated[] = "  The object is not created.";
+  std::vector<Failure> rows = {
+      {1, "", 0, E_OUT_OF_MEMORY, NoMemory(Known::kManagerNotCreated), 1, {}},
+      {2, "", 0, E_OUT_OF_MEMORY, NoMemory(kNotCreated), 2, {}},
+  };
+  if (Known::Callbacks().empty()) return rows;
+  const Lines unset = Unset<Manager>();
+  rows.push_back({3, "", 0, E_OUT_OF_MEMORY, NoMemory(""), 3, unset});
+  Lines calls = {"_Event::Initialize()"};
+  for (const result r : {E_OUT_OF_MEMORY, E_SYSTEM, result{0xA0001234}}) {
+    rows.push_back(
+        {0, "_Event::Initialize", static_cast<int>(r), r, Propagating(r), 4, calls + unset});
+  }
+  for (const std::string& callback : Known::Callbacks()) {
+    const std::string function = "sound_manager_set_" + callback + "_cb";
+    calls.push_back(function + "()");
+    for (const int code : {-12, -22, -38, -1}) {
+      const std::string cause =
+          SysNamed(E_SYSTEM, " A system error has been occurred. Failed to perform " + function +
+                                 " operation with error code : " + std::to_string(code));
+      rows.push_back({0, function, code, E_SYSTEM, cause, 3, calls + unset});
+    }
+  }
+  return rows;
+}
+
+template <typename Manager>
+class ManagerLife : public LibraryTest {
+ protected:
+  const Lines gates = {PrivilegeQuery<Manager>(), kFeatureQuery};
+
+  /// After a failed creation there is never a manager, and no second attempt.
+  void ExpectNoneForEver() {
+    SetLastResult(E_INVALID_STATE);
+    Host::RecordCalls(true);
+    EXPECT_EQ(Manager::GetInstance(), nullptr);
+    EXPECT_EQ(GetLastResult(), E_SUCCESS);
+    EXPECT_EQ(Host::TakeCalls(), gates);
+    EXPECT_THAT(log.Take(), ElementsAre(Propagating(E_SUCCESS)));
+  }
+
+  void ExpectFailedCreation(const Failure& row) {
+    std::optional<FailingLibraryAllocation> failing;
+    if (row.allocation > 0) failing.emplace(row.allocation);
+    if (!row.function.empty()) Host::FailCall(row.function.c_str(), row.code);
+    const std::ptrdiff_t live = CountLiveAllocations();
+    Host::RecordCalls(true);
+    EXPECT_EQ(Manager::GetInstance(), nullptr);
+    EXPECT_EQ(GetLastResult(), row.expected);
+    EXPECT_EQ(Host::TakeCalls(), gates + row.calls);
+    EXPECT_EQ(log.Take(), Lines{row.cause} + Lines(row.propagations, Propagating(row.expected)));
+    // What the device keeps once it has started isn't the library's.
+    if (row.allocation > 0) {
+      EXPECT_LE(CountLiveAllocations(), live);
+    }
+    failing.reset();
+    Host::ClearFailures();
+    ExpectNoneForEver();
+    std::thread([this] { ExpectNoneForEver(); }).join();
+  }
+};
+TYPED_TEST_SUITE(ManagerLife, Managers, ManagerNames);
+
+TYPED_TEST(ManagerLife, FailedCreationIsReportedByEachLayerUndoneAndNeverRepeated) {
+  for (const Failure& row : Failures<TypeParam>()) {
+    SCOPED_TRACE(row.cause);
+    InOwnProcess([&] { this->ExpectFailedCreation(row); });
+  }
+}
+
+TYPED_TEST(ManagerLife, AnyAllocationOfCreationMayFailAlsoThePlatforms) {
+  constexpr int kNoneFailed = 3;
+  int status = 0;
+  std::size_t sites = 0;
+  for (; status == 0; ++sites) {
+    status = StatusOfOwnProcess([&] {
+      FailingAllocation failing(sites + 1);
+      const bool made = TypeParam::GetInstance() != nullptr;
+      const result r = GetLastResult();
+      if (!failing.HasFailed()) std::exit(made ? kNoneFailed : 1);
+      EXPECT_FALSE(made);
+      EXPECT_TRUE(r == E_OUT_OF_MEMORY || r == E_SYSTEM) << GetErrorMessage(r);
+      this->log.Take();
+      this->ExpectNoneForEver();
+    });
+  }
+  EXPECT_EQ(status, kNoneFailed);
+  EXPECT_GT(sites, 2u);
+}
+
+TYPED_TEST(ManagerLife, RefusedGatesCreateNothingAndLeaveTheFirstCreationOpen) {
+  InOwnProcess([] {
+    const std::size_t before = CountAllocations();
+    Host::SetLogSink([](const Host::LogRecord&, void*) {},
+                     nullptr);  // the capture would allocate
+    Host::SetPrivilege(Facts<TypeParam>::kPrivilege, E_SYSTEM);
+    EXPECT_EQ(TypeParam::GetInstance(), nullptr);
+    EXPECT_EQ(GetLastResult(), E_PRIVILEGE_DENIED);
+    Host::ResetCapabilities();
+    for (const result answer : {Host::kFeatureAbsent, E_OBJ_NOT_FOUND}) {
+      Host::SetFeature("audio_manager", answer);
+      EXPECT_EQ(TypeParam::GetInstance(), nullptr);
+      EXPECT_EQ(GetLastResult(), E_UNSUPPORTED_OPERATION);
+    }
+    EXPECT_EQ(CountAllocations(), before);
+    Host::ResetCapabilities();
+    EXPECT_NE(TypeParam::GetInstance(), nullptr);
+    EXPECT_EQ(GetLastResult(), E_SUCCESS);
+  });
+}
+
+TYPED_TEST(ManagerLife, FirstCallsOfManyThreadsMakeOneManager) {
+  const std::size_t registrations = Facts<TypeParam>::Callbacks().empty() ? 0 : 1;
+  InOwnProcess([&] {
+    Host::RecordCalls(true);
+    std::promise<void> gate;
+    const auto open = gate.get_future().share();
+    std::array<std::future<TypeParam*>, 8> instances;
+    for (auto& instance : instances) {
+      instance = std::async(std::launch::async, [open] {
+        open.wait();
+        TypeParam* manager = TypeParam::GetInstance();
+        EXPECT_EQ(GetLastResult(), E_SUCCESS);
+        Facts<TypeParam>::Operations().back().call(*manager);  // whoever has it sees it whole
+        return manager;
+      });
+    }
+    gate.set_value();
+    TypeParam* const first = instances[0].get();
+    EXPECT_NE(first, nullptr);
+    for (std::size_t i = 1; i < instances.size(); ++i) EXPECT_EQ(instances[i].get(), first);
+    const Lines calls = Host::TakeCalls();
+    EXPECT_EQ(std::count(calls.begin(), calls.end(), "_Event::Initialize()"), registrations);
+  });
+}
+
+/// Runs its checks at exit, after the managers are gone: made before them.
+void CheckAtExit(std::function<void()> checks) {
+  static std::function<void()> kept;
+  kept = std::move(checks);
+  std::atexit([] {
+    kept();
+    if (testing::Test::HasFailure()) std::_Exit(1);
+  });
+}
+
+class ProcessExit : public LibraryTest {};
+
+TEST_F(ProcessExit, DeletesTheManagersUnregisteringFirstAndLateCallsFindNone) {
+  InOwnProcess([this] {
+    CheckAtExit([this] {
+      EXPECT_EQ(Host::TakeCalls(), Lines{"sound_manager_call_session_destroy(1)"} +
+                                       Unset<AudioSessionManager>() + Unset<AudioVolumeManager>());
+      EXPECT_EQ(AudioVolumeManager::GetInstance(), nullptr);
+      EXPECT_EQ(AudioSessionManager::GetInstance(), nullptr);
+      EXPECT_EQ(VoipAudioSessionManager::GetInstance(), nullptr);
+      EXPECT_EQ(GetLastResult(), E_SUCCESS);
+      EXPECT_EQ(log.Take(), Lines(3, Propagating(E_SUCCESS)));
+    });
+    EXPECT_NE(AudioVolumeManager::GetInstance(), nullptr);
+    EXPECT_NE(AudioSessionManager::GetInstance(), nullptr);
+    EXPECT_EQ(VoipAudioSessionManager::GetInstance()->EnterCallSession(), E_SUCCESS);
+    Host::RecordCalls(true);
+  });
+}
+
+struct Listener : IAudioVolumeEventListener, IAudioSessionEventListener {
+  void OnMediaVolumeChanged(int) override { ++calls; }
+  void OnAudioSessionInterruptStarted() override { ++calls; }
+  void OnAudioSessionInterruptFinished() override { ++calls; }
+
+  std::atomic<int> calls{0};
+};
+
+TEST_F(ProcessExit, ComesWhileTheDeviceStillReportsToListeners) {
+  InOwnProcess([] {
+    static Listener listener;  // lives longer than the managers
+    static std::atomic<bool> stop{false};
+    static std::array<std::thread, 2> sources;
+    Host::SetLogSink([](const Host::LogRecord&, void*) {}, nullptr);
+    CheckAtExit([] {
+      stop = true;
+      for (std::thread& source : sources) source.join();
+    });
+    AudioVolumeManager::GetInstance()->AddAudioVolumeEventListener(listener);
+    AudioSessionManager::GetInstance()->SetAudioSessionEventListener(&listener);
+    sources[0] = std::thread([] {
+      for (int level = 0; !stop; ++level) Simulated::ReportVolume(4, level);
+    });
+    sources[1] = std::thread([] {
+      for (int i = 0; !stop; ++i) {
+        Simulated::Interrupt(i % 7);
+        Simulated::ReportMuteAll(i % 2 == 0);
+      }
+    });
+    while (listener.calls < 100) std::this_thread::yield();
+  });
+}
+
+/// Holds the device's thread inside the library's callback, from its first log line on.
+struct Gate {
+  static void Park(const Host::LogRecord& record, void* gate) {
+    static_cast<Gate*>(gate)->Park(record);
+  }
+
+  void Park(const Host::LogRecord& record) {
+    if (std::string(record.message).rfind("This instance received", 0) != 0) return;
+    entered.set_value();
+    opened.get_future().wait();
+  }
+
+  std::promise<void> entered, opened;
+};
+
+TEST_F(ProcessExit, WaitsForACallbackThatIsRunning) {
+  InOwnProcess([] {
+    static Gate gate;
+    static Listener listener;
+    static std::thread opener;
+    static std::atomic<bool> tooLate{false};
+    CheckAtExit([] {
+      tooLate = true;
+      opener.join();
+    });
+    AudioSessionManager::GetInstance()->SetAudioSessionEventListener(&listener);
+    Host::SetLogSink(&Gate::Park, &gate);
+    Simulated::Interrupt(5);
+    gate.entered.get_future().wait();
+    Host::RecordCalls(true);
+    opener = std::thread([] {  // opens only once the manager is being destroyed
+      while (!tooLate && Host::TakeCalls() != Unset<AudioSessionManager>()) {
+        std::this_thread::yield();
+      }
+      EXPECT_FALSE(tooLate);
+      gate.opened.set_value();
+    });
+  });
+}
+
+}  // namespace

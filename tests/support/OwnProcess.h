@@ -1,0 +1,32 @@
+/// \file
+#pragma once
+
+#include <gtest/gtest.h>
+
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <cstdio>
+#include <cstdlib>
+
+/// Runs \p body in a process of its own, which then exits as a program does: with its exit handlers
+/// and the sanitizers' verdict. The program must have a single thread; checks within \p body count.
+/// \return its exit status, 0 when all went well; below 0 the signal that ended it
+template <typename Body>
+int StatusOfOwnProcess(Body body) {
+  std::fflush(nullptr);
+  const pid_t child = fork();
+  if (child == 0) {
+    body();
+    std::exit(testing::Test::HasFailure() ? 1 : 0);
+  }
+  int status = 0;
+  if (waitpid(child, &status, 0) != child) return -1;
+  return WIFEXITED(status) ? WEXITSTATUS(status) : -WTERMSIG(status);
+}
+
+/// The same for a body in which all is to go well.
+template <typename Body>
+void InOwnProcess(Body body) {
+  EXPECT_EQ(StatusOfOwnProcess(body), 0);
+}

@@ -21,7 +21,7 @@ thread_local bool onDispatcherThread = false;
 
 }  // namespace
 
-_Dispatcher::Arguments::~Arguments() {
+void _Dispatcher::Arguments::Clear() {
   while (first_ != nullptr) delete TakeFirst();
 }
 
@@ -79,6 +79,7 @@ void _Dispatcher::Stop() {
     stopped_ = true;
     dropped.AppendAll(batch_);
     dropped.AppendAll(queue_);
+    dropped.AppendAll(spent_);
     delivered_.notify_all();
     queued_.notify_one();
   }
@@ -87,6 +88,7 @@ void _Dispatcher::Stop() {
     thread_.detach();  // a listener ends the process: its call never returns
   } else {
     thread_.join();
+    deliveredBatch_.Clear();
   }
 }
 
@@ -97,6 +99,8 @@ result _Dispatcher::Fire(_Event& event, IEventArg& arg) {
   arg.__pEvent = &event;
   arg.__number = ++lastNumber_;
   queue_.Append(*owned.release());
+  const bool own = spent_.First() != nullptr && spent_.First()->__pEvent == &event;
+  const std::unique_ptr<IEventArg> spent(own ? spent_.TakeFirst() : nullptr);
   const bool wake = std::exchange(sleeping_, false);
   lock.unlock();
   if (wake) queued_.notify_one();
@@ -124,23 +128,25 @@ result _Dispatcher::Remove(Listeners& listeners, const IEventListener& listener)
 }
 
 void _Dispatcher::Close(_Event& event) {
-  Arguments dropped;  // freed, as the listeners are, when the locks are released
+  Arguments freed;  // when the locks are released, as the listeners are
   std::unique_ptr<Listeners> listeners;
   std::unique_lock lock(mutex_);
   listeners = std::move(event.__pListeners);
   {
     std::lock_guard queueLock(queueMutex_);
-    dropped.AppendAllOf(event, batch_);
-    dropped.AppendAllOf(event, queue_);
+    freed.AppendAllOf(event, batch_);
+    freed.AppendAllOf(event, queue_);
   }
   delivered_.notify_all();
   listeners->RemoveAll();
-  if (delivering_ != listeners.get()) return;
   if (onDispatcherThread) {
-    orphans_ = std::move(listeners);
-  } else {
-    WaitWhile(lock, [&] { return delivering_ == listeners.get(); });
+    if (delivering_ == listeners.get()) orphans_ = std::move(listeners);
+    return;
   }
+  WaitWhile(lock, [&] { return delivering_ == listeners.get() || freeing_ > 0; });
+  std::lock_guard queueLock(queueMutex_);
+  freed.AppendAllOf(event, deliveredBatch_);
+  freed.AppendAllOf(event, spent_);
 }
 
 void _Dispatcher::Run() {
@@ -154,16 +160,31 @@ void _Dispatcher::Run() {
 /// \return false when the process is ending
 bool _Dispatcher::TakeBatch(std::unique_lock<std::mutex>& lock) {
   for (;;) {
+    Arguments left;
     {
       std::lock_guard queueLock(queueMutex_);
       if (stopped_) return false;
       batch_.AppendAll(queue_);
+      left.AppendAll(spent_);
+      (batch_.First() != nullptr ? spent_ : left).AppendAll(deliveredBatch_);
     }
+    Free(left, lock);
     if (batch_.First() != nullptr) return true;
     lock.unlock();
     WaitForArguments();
     lock.lock();
   }
+}
+
+/// Frees what has been delivered; \p lock, the batch's, is released meanwhile.
+void _Dispatcher::Free(Arguments& arguments, std::unique_lock<std::mutex>& lock) {
+  if (arguments.First() == nullptr) return;
+  ++freeing_;
+  lock.unlock();
+  arguments.Clear();
+  lock.lock();
+  --freeing_;
+  if (waiting_ != 0) progressed_.notify_all();
 }
 
 void _Dispatcher::WaitForArguments() {
@@ -182,8 +203,8 @@ void _Dispatcher::Deliver(std::unique_ptr<IEventArg> arg, std::unique_lock<std::
   deliveringNumber_ = arg->__number;
   lock.unlock();
   TellListeners(event, listeners, *arg);
-  arg.reset();
   lock.lock();
+  deliveredBatch_.Append(*arg.release());
   FinishDelivery(listeners);
 }
 
@@ -250,6 +271,13 @@ void _Dispatcher::WaitUntilDelivered() {
     awaited_ = std::min(awaited_, last);
     delivered_.wait(lock);
   }
+  Arguments spent;
+  queueLock.lock();
+  spent.AppendAll(deliveredBatch_);
+  spent.AppendAll(spent_);
+  queueLock.unlock();
+  Free(spent, lock);
+  WaitWhile(lock, [this] { return freeing_ > 0; });
 }
 
 std::uint64_t _Dispatcher::OldestUndelivered() {

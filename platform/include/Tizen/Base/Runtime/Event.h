@@ -21,8 +21,9 @@ class _Event : public Tizen::Base::Object {
   _Event();
 
   /// Drops and frees what is still queued, and waits for a listener's call that is running and for
-  /// its argument to be freed. From inside a listener's call of this very event it doesn't wait:
-  /// the other listeners then hear nothing more and the argument is freed when the call returns.
+  /// the arguments that were delivered to be freed. From inside a listener's call it doesn't wait: of
+  /// this very event the other listeners then hear nothing more, and what was delivered is freed
+  /// later.
   ~_Event() override;
 
   /// Makes the event ready; until then every other operation fails with `E_INVALID_STATE`. The type
@@ -44,7 +45,7 @@ class _Event : public Tizen::Base::Object {
   result RemoveListener(const IEventListener& listener);
 
   /// Queues \p arg, which was made with `new` and belongs to the platform from now on: it is freed
-  /// after the last delivery, or at once when this fails. Allocates nothing.
+  /// after the last delivery, on any thread, or at once when this fails. Allocates nothing.
   /// \return `E_SUCCESS`, or another code when nothing was queued; `E_SYSTEM` when the process is
   /// ending
   result FireAsync(IEventArg& arg);

@@ -1,5 +1,7 @@
 #include "AudioSink.h"
 
+#include "sound/Session.h"
+
 #include <pulse/pulseaudio.h>
 
 #include <chrono>
@@ -40,11 +42,22 @@ bool IsSoundServerThere() {
   return isThere;
 }
 
+/// Tells the server what the stream is: the session's role, and that it is a player's.
+void SetStreamProperties(GstElement* sink) {
+  const std::unique_ptr<GstStructure, FreeWith<gst_structure_free>> properties(
+      gst_structure_new("properties", "media.role", G_TYPE_STRING, GetPlayerRole(), kPlayerProperty,
+                        G_TYPE_STRING, "1", nullptr));
+  g_object_set(sink, "stream-properties", properties.get(), nullptr);
+}
+
 }  // namespace
 
 ElementPtr MakeAudioSink() {
   if (IsSoundServerThere()) {
-    if (ElementPtr sink = MakeElement("pulsesink")) return sink;
+    if (ElementPtr sink = MakeElement("pulsesink")) {
+      SetStreamProperties(sink.get());
+      return sink;
+    }
   }
   ElementPtr sink = MakeElement("fakesink");
   if (sink != nullptr) g_object_set(sink.get(), "sync", TRUE, nullptr);

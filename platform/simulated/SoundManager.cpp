@@ -1,6 +1,6 @@
 // The simulated device's sound manager: everything in memory.
 
-#include "CallbackThread.h"
+#include <sound/CallbackThread.h>
 
 #include <Host/Calls.h>
 #include <Simulated/Device.h>
@@ -12,10 +12,10 @@
 
 namespace {
 
-using Simulated::CallbackThread;
+using Host::CallbackThread;
+using Host::Kind;
+using Host::Report;
 using Simulated::CallSessionFault;
-using Simulated::Kind;
-using Simulated::Report;
 
 struct Volume {
   int max;

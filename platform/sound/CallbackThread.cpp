@@ -3,12 +3,16 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <chrono>
 #include <cstdlib>
 #include <new>
 #include <utility>
 
 namespace Host {
 namespace {
+
+/// A local server answers in less.
+constexpr std::chrono::microseconds kAwake{300};
 
 thread_local bool onCallbackThread = false;
 
@@ -38,7 +42,25 @@ void CallbackThread::Post(const Report& report) {
   if (stopped_ || SlotOf(report.kind).callback == nullptr) return;
   queue_.push_back(report);
   ++postedCount_;
+  hasNews_.store(true, std::memory_order_release);
   if (std::exchange(sleeping_, false)) queued_.notify_one();
+}
+
+void CallbackThread::Prepare(Kind kind) {
+  if (SlotOf(kind).callback == nullptr) return;
+  prepared_ = true;
+  if (std::exchange(sleeping_, false)) queued_.notify_one();
+}
+
+void CallbackThread::StayAwake(std::unique_lock<std::mutex>& lock) {
+  prepared_ = false;
+  hasNews_ = false;
+  lock.unlock();
+  const auto end = std::chrono::steady_clock::now() + kAwake;
+  while (!hasNews_.load(std::memory_order_acquire) && std::chrono::steady_clock::now() < end) {
+    std::this_thread::yield();
+  }
+  lock.lock();
 }
 
 void CallbackThread::DropReports() {
@@ -110,8 +132,12 @@ void CallbackThread::Run() {
 bool CallbackThread::TakeBatch() {
   std::unique_lock lock(mutex_);
   while (queue_.empty() && !stopped_) {
-    sleeping_ = true;
-    queued_.wait(lock);
+    if (prepared_) {
+      StayAwake(lock);
+    } else {
+      sleeping_ = true;
+      queued_.wait(lock);
+    }
   }
   sleeping_ = false;
   batch_.swap(queue_);

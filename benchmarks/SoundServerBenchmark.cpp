@@ -1,0 +1,330 @@
+// Compares the library on a sound server with the same libpulse calls made directly, and with
+// `pactl`, and fails when a ratio is on the wrong side of its limit. Uses a server of its own.
+
+#include "desktop/SoundServer.h"
+
+#include <Zelkora/Media/AudioVolumeManager.h>
+#include <Zelkora/Media/IAudioVolumeEventListener.h>
+#include <pulse/ext-stream-restore.h>
+#include <pulse/pulseaudio.h>
+
+#include <algorithm>
+#include <chrono>
+#include <condition_variable>
+#include <cstdio>
+#include <cstdlib>
+#include <cstring>
+#include <exception>
+#include <functional>
+#include <map>
+#include <mutex>
+#include <random>
+#include <stdexcept>
+#include <string>
+#include <vector>
+
+namespace {
+
+using Zelkora::Media::AudioVolumeManager;
+using Clock = std::chrono::steady_clock;
+
+constexpr int kCalls = 2000;  // of each kind and side
+constexpr int kPactlCalls = 60;
+constexpr int kBlocks = 100;  // processes of each side that wait for changes
+constexpr int kChanges = 20;  // in each of them
+constexpr int kMax = 15;
+constexpr char kEntry[] = "sink-input-by-media-role:music";
+
+void Require(bool condition, const char* what) {
+  if (!condition) throw std::runtime_error(what);
+}
+
+pa_volume_t ToVolume(int level) { return static_cast<pa_volume_t>((level * 65536 + 7) / kMax); }
+
+/// A program's own use of libpulse: a threaded main loop, and a wait for each answer.
+class Direct {
+ public:
+  Direct() : loop_(pa_threaded_mainloop_new()) {
+    context_ = pa_context_new(pa_threaded_mainloop_get_api(loop_), "direct");
+    pa_context_set_state_callback(
+        context_, [](pa_context*, void* self) { Wake(self); }, this);
+    pa_threaded_mainloop_start(loop_);
+    Locked([&] {
+      pa_context_connect(context_, nullptr, PA_CONTEXT_NOAUTOSPAWN, nullptr);
+      while (pa_context_get_state(context_) != PA_CONTEXT_READY) pa_threaded_mainloop_wait(loop_);
+    });
+  }
+
+  ~Direct() {
+    Locked([&] {
+      pa_context_set_state_callback(context_, nullptr, nullptr);
+      pa_context_disconnect(context_);
+      pa_context_unref(context_);
+    });
+    pa_threaded_mainloop_stop(loop_);
+    pa_threaded_mainloop_free(loop_);
+  }
+
+  Direct(const Direct&) = delete;
+  Direct& operator=(const Direct&) = delete;
+
+  int GetLevel() {
+    Locked([&] { Read(); });
+    return static_cast<int>((pa_cvolume_max(&entry_.volume) * kMax + 32768) / 65536);
+  }
+
+  void SetLevel(int level) {
+    Locked([&] {
+      Read();
+      pa_cvolume_scale(&entry_.volume, ToVolume(level));
+      Await(pa_ext_stream_restore_write(context_, PA_UPDATE_REPLACE, &entry_, 1, true, OnSuccess,
+                                        this));
+    });
+  }
+
+  void SetStreamLevel(int stream, int level) {
+    pa_cvolume volume;
+    pa_cvolume_set(&volume, 2, ToVolume(level));
+    Locked([&] {
+      Await(pa_context_set_sink_input_volume(context_, static_cast<std::uint32_t>(stream), &volume,
+                                             OnSuccess, this));
+    });
+  }
+
+  /// Has \p changed called on the loop's thread for each change of a stream, after reading it.
+  void Watch(std::function<void(int)> changed) {
+    changed_ = std::move(changed);
+    Locked([&] {
+      pa_context_set_subscribe_callback(context_, OnEvent, this);
+      Await(pa_context_subscribe(context_, PA_SUBSCRIPTION_MASK_SINK_INPUT, OnSuccess, this));
+    });
+  }
+
+ private:
+  template <typename Operation>
+  void Locked(Operation operation) {
+    pa_threaded_mainloop_lock(loop_);
+    operation();
+    pa_threaded_mainloop_unlock(loop_);
+  }
+
+  static void Wake(void* self) {
+    pa_threaded_mainloop_signal(static_cast<Direct*>(self)->loop_, false);
+  }
+  static void OnSuccess(pa_context*, int, void* self) { Wake(self); }
+
+  void Await(pa_operation* operation) {
+    while (pa_operation_get_state(operation) == PA_OPERATION_RUNNING) {
+      pa_threaded_mainloop_wait(loop_);
+    }
+    pa_operation_unref(operation);
+  }
+
+  void Read() {
+    entry_.name = nullptr;
+    Await(pa_ext_stream_restore_read(context_, OnEntry, this));
+    Require(entry_.name != nullptr, "nothing is stored for music");
+  }
+
+  static void OnEntry(pa_context*, const pa_ext_stream_restore_info* info, int end, void* self) {
+    auto& direct = *static_cast<Direct*>(self);
+    if (end != 0) return Wake(self);
+    if (std::strcmp(info->name, kEntry) != 0) return;
+    direct.entry_ = *info;
+    direct.entry_.name = kEntry;
+    direct.device_ = info->device != nullptr ? info->device : "";
+    direct.entry_.device = info->device != nullptr ? direct.device_.c_str() : nullptr;
+  }
+
+  static void OnEvent(pa_context* context, pa_subscription_event_type_t, std::uint32_t index,
+                      void* self) {
+    pa_operation_unref(pa_context_get_sink_input_info(context, index, OnStream, self));
+  }
+
+  static void OnStream(pa_context*, const pa_sink_input_info* info, int, void* self) {
+    if (info == nullptr) return;
+    static_cast<Direct*>(self)->changed_(
+        static_cast<int>((pa_cvolume_max(&info->volume) * kMax + 32768) / 65536));
+  }
+
+  pa_threaded_mainloop* loop_;
+  pa_context* context_;
+  pa_ext_stream_restore_info entry_ = {};
+  std::string device_;
+  std::function<void(int)> changed_;
+};
+
+double Microseconds(Clock::duration time) {
+  return std::chrono::duration<double, std::micro>(time).count();
+}
+
+template <typename Call>
+double Measure(Call call) {
+  const auto begin = Clock::now();
+  call();
+  return Microseconds(Clock::now() - begin);
+}
+
+double Median(std::vector<double> values) {
+  const auto middle = values.begin() + static_cast<std::ptrdiff_t>(values.size() / 2);
+  std::nth_element(values.begin(), middle, values.end());
+  return *middle;
+}
+
+/// One listener's wait for the level of a change that is being made.
+class Waiter {
+ public:
+  void Expect(int level) {
+    std::lock_guard lock(mutex_);
+    expected_ = level;
+    hasArrived_ = false;
+  }
+
+  void Arrive(int level) {
+    const auto now = Clock::now();
+    std::lock_guard lock(mutex_);
+    if (level != expected_ || hasArrived_) return;
+    arrival_ = now;
+    hasArrived_ = true;
+    arrived_.notify_one();
+  }
+
+  Clock::time_point Await() {
+    std::unique_lock lock(mutex_);
+    const bool came = arrived_.wait_for(lock, std::chrono::seconds(5), [&] { return hasArrived_; });
+    Require(came, "a change isn't reported");
+    return arrival_;
+  }
+
+ private:
+  std::mutex mutex_;
+  std::condition_variable arrived_;
+  int expected_ = -1;
+  bool hasArrived_ = false;
+  Clock::time_point arrival_;
+};
+
+class LibraryListener : public Zelkora::Media::IAudioVolumeEventListener {
+ public:
+  explicit LibraryListener(Waiter& waiter) : waiter_(waiter) {}
+  void OnMediaVolumeChanged(int level) override { waiter_.Arrive(level); }
+
+ private:
+  Waiter& waiter_;
+};
+
+/// A process of its own, so that no side makes work for the other: prints the times from a change by
+/// another client until the listener has the level.
+int PrintChangeTimes(bool withLibrary, int stream) {
+  static Waiter waiter;
+  static LibraryListener listener(waiter);
+  static Direct raw;
+  if (withLibrary) {
+    AudioVolumeManager* volume = AudioVolumeManager::GetInstance();
+    Require(volume->AddAudioVolumeEventListener(listener) == E_SUCCESS, "no listener");
+  } else {
+    raw.Watch([](int level) { waiter.Arrive(level); });
+  }
+  Direct other;
+  for (int i = 0; i < kChanges; ++i) {
+    const int level = 1 + i % 2;
+    waiter.Expect(level);
+    const auto begin = Clock::now();
+    other.SetStreamLevel(stream, level);
+    std::printf("%f\n", Microseconds(waiter.Await() - begin));
+  }
+  return 0;
+}
+
+std::vector<double> ReadTimes(const char* side, int stream) {
+  Program program({"/proc/self/exe", side, std::to_string(stream)});
+  std::vector<double> times;
+  for (std::string line = program.ReadLine(); !line.empty(); line = program.ReadLine()) {
+    times.push_back(std::stod(line));
+  }
+  Require(times.size() == kChanges, "a listening process fails");
+  return times;
+}
+
+using Samples = std::map<std::string, std::vector<double>>;
+
+void MeasureCalls(AudioVolumeManager& volume, int stream, Samples& samples) {
+  Direct direct;
+  std::mt19937 random(1);
+  std::vector<std::pair<const char*, std::function<void(int)>>> calls = {
+      {"library set", [&](int level) { volume.SetMediaVolumeLevel(level); }},
+      {"direct set", [&](int level) { direct.SetLevel(level); }},
+      {"library get", [&](int) { volume.GetCurrentMediaVolumeLevel(); }},
+      {"direct get", [&](int) { direct.GetLevel(); }},
+  };
+  for (int i = 0; i < kCalls; ++i) {
+    std::shuffle(calls.begin(), calls.end(), random);
+    for (const auto& [name, call] : calls) {
+      const int level = static_cast<int>(random() % (kMax + 1));
+      samples[name].push_back(Measure([&] { call(level); }));
+    }
+    if (i % (kCalls / kPactlCalls) != 0) continue;
+    samples["pactl"].push_back(Measure([&] {
+      Pactl({"set-sink-input-volume", std::to_string(stream), std::to_string(i % 100) + "%"});
+    }));
+  }
+}
+
+void MeasureChanges(int stream, Samples& samples) {
+  std::mt19937 random(1);
+  std::vector<const char*> sides;
+  for (int i = 0; i < kBlocks; ++i) sides.insert(sides.end(), {"library change", "raw change"});
+  std::shuffle(sides.begin(), sides.end(), random);
+  for (const char* side : sides) {
+    const std::vector<double> times = ReadTimes(side, stream);
+    samples[side].insert(samples[side].end(), times.begin(), times.end());
+  }
+}
+
+/// \return whether the ratio of the medians is at most \p limit
+bool Compare(const Samples& samples, const char* library, const char* other, double limit) {
+  const double mine = Median(samples.at(library));
+  const double theirs = Median(samples.at(other));
+  const bool holds = mine / theirs <= limit;
+  std::printf("%s %.1f us, %s %.1f us, ratio %.3f, limit %.3f: %s\n", library, mine, other, theirs,
+              mine / theirs, limit, holds ? "holds" : "EXCEEDED");
+  return holds;
+}
+
+/// \param limits of the ratios of calls, of changes, and of `pactl` to a call
+int RunAll(double callLimit, double changeLimit, double pactlLimit) {
+  SoundServer server;
+  server.Start();
+  const Player player({"media.role=music"});
+  AudioVolumeManager* volume = AudioVolumeManager::GetInstance();
+  Require(volume != nullptr, "no volume manager");
+  Require(volume->SetMediaVolumeLevel(5) == E_SUCCESS, "the level can't be set");
+  Samples samples;
+  MeasureCalls(*volume, player.GetIndex(), samples);
+  MeasureChanges(player.GetIndex(), samples);
+  bool holds = Compare(samples, "library set", "direct set", callLimit);
+  holds = Compare(samples, "library get", "direct get", callLimit) && holds;
+  holds = Compare(samples, "library change", "raw change", changeLimit) && holds;
+  return Compare(samples, "library set", "pactl", 1 / pactlLimit) && holds ? 0 : 1;
+}
+
+int Run(int count, char** arguments) {
+  const std::string first = count > 1 ? arguments[1] : "";
+  if (first == "library change" || first == "raw change") {
+    return PrintChangeTimes(first == "library change", std::stoi(arguments[2]));
+  }
+  const auto limit = [&](int index, double otherwise) {
+    return count > index ? std::stod(arguments[index]) : otherwise;
+  };
+  return RunAll(limit(1, 1.05), limit(2, 1.10), limit(3, 40));
+}
+
+}  // namespace
+
+/// Arguments: the limits of the ratios of calls, of changes, and of `pactl` to a call.
+int main(int count, char** arguments) try {
+  return Run(count, arguments);
+} catch (const std::exception& exception) {
+  std::fprintf(stderr, "%s\n", exception.what());
+  return 2;
+}

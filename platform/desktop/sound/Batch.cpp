@@ -1,0 +1,42 @@
+#include "Batch.h"
+
+namespace Desktop {
+
+Batch::~Batch() {
+  for (const OperationPtr& operation : operations_) {
+    if (pa_operation_get_state(operation.get()) == PA_OPERATION_RUNNING) {
+      pa_operation_cancel(operation.get());
+    }
+  }
+}
+
+void Batch::Keep(pa_operation* operation) {
+  if (operation == nullptr) {
+    error_ = PA_ERR_BADSTATE;
+    return;
+  }
+  OperationPtr owned(operation);
+  operations_.push_back(std::move(owned));
+  ++outstanding_;
+}
+
+void Batch::OnAnswer(pa_context* context, int success, void* self) {
+  static_cast<Batch*>(self)->Finish(success ? PA_OK : pa_context_errno(context));
+}
+
+void Batch::OnStreamAnswer(pa_stream* stream, int success, void* self) {
+  OnAnswer(pa_stream_get_context(stream), success, self);
+}
+
+void Batch::OnOptionalAnswer(pa_context*, int, void* self) {
+  static_cast<Batch*>(self)->Finish(PA_OK);
+}
+
+void Batch::Finish(int error) {
+  if (error_ == PA_OK) error_ = error;
+  if (--outstanding_ > 0) return;
+  if (error_ == PA_OK) onSuccess_();
+  done_.notify_all();
+}
+
+}  // namespace Desktop

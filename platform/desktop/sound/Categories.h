@@ -1,0 +1,74 @@
+/// \file
+/// Sound categories, their media roles on the server, and their levels.
+#pragma once
+
+#include <pulse/volume.h>
+
+#include <array>
+#include <cstddef>
+#include <cstring>
+
+namespace Desktop {
+
+/// A sound type of the native interface.
+using Category = int;
+
+inline constexpr Category kNoCategory = -1;
+inline constexpr Category kSystem = 0;
+inline constexpr Category kNotification = 1;
+inline constexpr Category kAlarm = 2;
+inline constexpr Category kRingtone = 3;
+inline constexpr Category kMedia = 4;
+inline constexpr Category kCall = 5;
+inline constexpr std::size_t kCategories = 6;
+
+struct RoleRow {
+  const char* role;
+  Category category;
+};
+
+/// Where a category has several roles, the first that has a stored volume tells its level at start.
+inline constexpr std::array<RoleRow, 8> kRoles = {{{"event", kSystem},
+                                                   {"notification", kNotification},
+                                                   {"alarm", kAlarm},
+                                                   {"ringtone", kRingtone},
+                                                   {"music", kMedia},
+                                                   {"video", kMedia},
+                                                   {"game", kMedia},
+                                                   {"phone", kCall}}};
+
+constexpr bool IsCategory(int type) { return type >= 0 && type < static_cast<int>(kCategories); }
+
+inline constexpr std::size_t kNoRole = kRoles.size();
+
+/// \return the role's place in the table, or `kNoRole`
+inline std::size_t FindRole(const char* role) {
+  std::size_t i = 0;
+  while (i < kRoles.size() && std::strcmp(kRoles[i].role, role) != 0) ++i;
+  return i;
+}
+
+/// Every category's highest level; it stands for a volume of 100 %.
+inline constexpr int kMaxLevel = 15;
+
+constexpr bool IsLevel(int level) { return level >= 0 && level <= kMaxLevel; }
+
+constexpr pa_volume_t ToVolume(int level) {
+  return (static_cast<pa_volume_t>(level) * PA_VOLUME_NORM + kMaxLevel / 2) / kMaxLevel;
+}
+
+/// \return the nearest level; a volume above 100 % is the highest
+constexpr int ToLevel(pa_volume_t volume) {
+  const pa_volume_t limited = volume < PA_VOLUME_NORM ? volume : PA_VOLUME_NORM;
+  return static_cast<int>((limited * kMaxLevel + PA_VOLUME_NORM / 2) / PA_VOLUME_NORM);
+}
+
+constexpr bool DoLevelsComeBack() {
+  for (int level = 0; level <= kMaxLevel; ++level) {
+    if (ToLevel(ToVolume(level)) != level) return false;
+  }
+  return true;
+}
+static_assert(DoLevelsComeBack(), "a level that is set must be read as the same");
+
+}  // namespace Desktop

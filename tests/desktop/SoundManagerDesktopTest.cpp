@@ -1,0 +1,617 @@
+// The desktop's sound manager on a PulseAudio of the test's own, with `pactl`, `pacat` and another
+// process of this program as the other parties.
+
+#include "SoundServer.h"
+
+#include <Tizen/Media/Player.h>
+#include <Zelkora/Media/AudioSessionManager.h>
+#include <Zelkora/Media/AudioVolumeManager.h>
+#include <Zelkora/Media/IAudioSessionEventListener.h>
+#include <Zelkora/Media/IAudioVolumeEventListener.h>
+#include <Zelkora/Media/VoipAudioSessionManager.h>
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+#include <malloc.h>
+#include <sound_manager.h>
+
+#include <chrono>
+#include <condition_variable>
+#include <csignal>
+#include <cstdio>
+#include <cstdlib>
+#include <deque>
+#include <filesystem>
+#include <mutex>
+#include <optional>
+#include <thread>
+
+namespace {
+
+using testing::ElementsAre;
+using testing::IsEmpty;
+
+constexpr int kSystem = 0;
+constexpr int kMedia = 4;
+constexpr int kCategories = 6;
+constexpr int kMax = 15;
+constexpr const char* kRoleOf[kCategories] = {"event",    "notification", "alarm",
+                                              "ringtone", "music",        "phone"};
+
+constexpr std::chrono::seconds kBound{10};
+
+std::string Role(const std::string& role) { return "media.role=" + role; }
+std::string RoleLine(const std::string& role) { return "media.role = \"" + role + "\""; }
+
+int VolumeOf(int level) { return (level * 65536 + kMax / 2) / kMax; }
+
+int GetLevel(int type) {
+  int level = -1;
+  EXPECT_EQ(sound_manager_get_volume(type, &level), 0);
+  return level;
+}
+
+/// What callbacks have brought and nobody has taken.
+template <typename Value>
+class Inbox {
+ public:
+  void Put(Value value) {
+    std::lock_guard lock(mutex_);
+    values_.push_back(value);
+    arrived_.notify_all();
+  }
+
+  /// \return the next value, waited for
+  std::optional<Value> Take() {
+    std::unique_lock lock(mutex_);
+    if (!arrived_.wait_for(lock, kBound, [&] { return !values_.empty(); })) return std::nullopt;
+    const Value value = values_.front();
+    values_.pop_front();
+    return value;
+  }
+
+ private:
+  std::mutex mutex_;
+  std::condition_variable arrived_;
+  std::deque<Value> values_;
+};
+
+struct Change {
+  int type;
+  int level;
+  bool operator==(const Change& other) const { return type == other.type && level == other.level; }
+};
+
+std::ostream& operator<<(std::ostream& out, const Change& change) {
+  return out << "type " << change.type << " level " << change.level;
+}
+
+/// Hears everything while it lives.
+class Listener {
+ public:
+  Listener() {
+    EXPECT_EQ(sound_manager_set_volume_changed_cb(OnVolume, this), 0);
+    EXPECT_EQ(sound_manager_set_muteall_changed_cb(OnMuteAll, this), 0);
+    EXPECT_EQ(sound_manager_set_session_interrupted_cb(OnInterrupted, this), 0);
+  }
+  ~Listener() {
+    sound_manager_unset_volume_changed_cb();
+    sound_manager_unset_muteall_changed_cb();
+    sound_manager_unset_session_interrupted_cb();
+  }
+
+  /// \return the changes of levels so far. What has come to the server before is heard before a
+  /// change that is made afterwards.
+  std::vector<Change> TakeChanges() {
+    const int level = GetLevel(kSystem);
+    const Change mark = {kSystem, level == 0 ? 1 : level - 1};
+    EXPECT_EQ(sound_manager_set_volume(mark.type, mark.level), 0);
+    std::vector<Change> changes;
+    for (auto change = volumes.Take(); change && !(*change == mark); change = volumes.Take()) {
+      changes.push_back(*change);
+    }
+    return changes;
+  }
+
+  Inbox<Change> volumes;
+  Inbox<bool> mutes;
+  Inbox<int> interruptions;
+
+ private:
+  static void OnVolume(int type, int level, void* self) {
+    static_cast<Listener*>(self)->volumes.Put({type, level});
+  }
+  static void OnMuteAll(bool muteall, void* self) {
+    static_cast<Listener*>(self)->mutes.Put(muteall);
+  }
+  static void OnInterrupted(int code, void* self) {
+    static_cast<Listener*>(self)->interruptions.Put(code);
+  }
+};
+
+/// Another process of this program, with a call open.
+class OtherCall : public Program {
+ public:
+  OtherCall() : Program({std::filesystem::read_symlink("/proc/self/exe"), "--call"}) {
+    EXPECT_EQ(ReadLine(), "open");
+  }
+};
+
+class SoundManagerDesktop : public testing::Test {
+ protected:
+  SoundManagerDesktop() { server.Start(); }
+
+  SoundServer server;
+};
+
+TEST_F(SoundManagerDesktop, EveryLevelComesBackAndMovesTheStreamsOfItsRole) {
+  for (int type = 0; type < kCategories; ++type) {
+    SCOPED_TRACE(kRoleOf[type]);
+    int max = 0;
+    ASSERT_EQ(sound_manager_get_max_volume(type, &max), 0);
+    ASSERT_EQ(max, kMax);
+    const Player player({Role(kRoleOf[type])});
+    for (int level = 0; level <= kMax; ++level) {
+      ASSERT_EQ(sound_manager_set_volume(type, level), 0);
+      EXPECT_EQ(GetLevel(type), level);
+      EXPECT_EQ(ListStreams(RoleLine(kRoleOf[type])).at(0).volume, VolumeOf(level));
+    }
+    EXPECT_EQ(sound_manager_set_volume(type, -1), -22);
+    EXPECT_EQ(sound_manager_set_volume(type, kMax + 1), -22);
+    EXPECT_EQ(GetLevel(type), kMax);
+  }
+  EXPECT_EQ(sound_manager_set_volume(kCategories, 1), -22);
+}
+
+TEST_F(SoundManagerDesktop, LevelIsStoredForStreamsToCome) {
+  for (int type = 0; type < kCategories; ++type) {
+    ASSERT_EQ(sound_manager_set_volume(type, type + 3), 0);
+  }
+  for (const char* role : {"event", "notification", "alarm", "ringtone", "phone"}) {
+    const Player player({Role(role)});
+  }
+  for (int type = 0; type < kCategories; ++type) {
+    SCOPED_TRACE(kRoleOf[type]);
+    const Player player({Role(kRoleOf[type])});
+    EXPECT_EQ(ListStreams(RoleLine(kRoleOf[type])).at(0).volume, VolumeOf(type + 3));
+    EXPECT_EQ(GetLevel(type), type + 3);
+  }
+}
+
+TEST_F(SoundManagerDesktop, MediaIsMusicVideoGamesAndStreamsWithoutRole) {
+  const Player music({Role("music")});
+  const Player video({Role("video")});
+  const Player game({Role("game")});
+  const Player plain({});
+  const Player other({Role("test")});
+  ASSERT_EQ(sound_manager_set_volume(kMedia, 6), 0);
+  for (const ListedStream& stream : ListStreams("Sink Input")) {
+    const bool isOther = stream.index == other.GetIndex();
+    EXPECT_EQ(stream.volume, VolumeOf(isOther ? kMax : 6)) << stream.description;
+  }
+}
+
+TEST_F(SoundManagerDesktop, StreamThatIsMovedByAnotherProgramIsReportedOnce) {
+  Listener listener;
+  for (int type = 1; type < kCategories; ++type) {
+    SCOPED_TRACE(kRoleOf[type]);
+    const Player player({Role(kRoleOf[type])});
+    Pactl({"set-sink-input-volume", std::to_string(player.GetIndex()), "40%"});
+    EXPECT_EQ(listener.volumes.Take(), (Change{type, 6}));
+    EXPECT_THAT(listener.TakeChanges(), IsEmpty());
+    EXPECT_EQ(GetLevel(type), 6);
+  }
+  const Player plain({});
+  Pactl({"set-sink-input-volume", std::to_string(plain.GetIndex()), "80%"});
+  EXPECT_EQ(listener.volumes.Take(), (Change{kMedia, 12}));
+  // Less than a step, and then nothing at all.
+  Pactl({"set-sink-input-volume", std::to_string(plain.GetIndex()), "81%"});
+  Pactl({"set-sink-input-volume", std::to_string(plain.GetIndex()), "81%"});
+  EXPECT_THAT(listener.TakeChanges(), IsEmpty());
+}
+
+TEST_F(SoundManagerDesktop, OwnChangeIsReportedOnceAndTheSameAgainNot) {
+  Listener listener;
+  const Player music({Role("music")});
+  const Player plain({});
+  const std::vector<int> levels = {9, 9, 3, 3, 0, 15, 15};
+  for (const int level : levels) ASSERT_EQ(sound_manager_set_volume(kMedia, level), 0);
+  EXPECT_THAT(listener.TakeChanges(), ElementsAre(Change{kMedia, 9}, Change{kMedia, 3},
+                                                  Change{kMedia, 0}, Change{kMedia, 15}));
+}
+
+TEST_F(SoundManagerDesktop, BalanceMuteAndOtherRolesOutliveALevel) {
+  const Player player({Role("music"), "test.name=balanced"});
+  const std::string index = std::to_string(player.GetIndex());
+  Pactl({"set-sink-input-volume", index, "100%", "50%"});
+  Pactl({"set-sink-input-mute", index, "1"});
+  ASSERT_EQ(sound_manager_set_volume(kMedia, 9), 0);
+  const ListedStream stream = ListStreams("balanced").at(0);
+  EXPECT_THAT(stream.description, testing::HasSubstr("Mute: yes"));
+  EXPECT_THAT(stream.description, testing::ContainsRegex("front-left: *[0-9]+ / *60%"));
+  EXPECT_THAT(stream.description, testing::ContainsRegex("front-right: *[0-9]+ / *30%"));
+  EXPECT_EQ(GetLevel(kMedia), 9);
+}
+
+TEST_F(SoundManagerDesktop, MuteAllIsTheDefaultSinksAndFollowsIt) {
+  Listener listener;
+  bool isMuted = true;
+  ASSERT_EQ(sound_manager_get_muteall(&isMuted), 0);
+  EXPECT_FALSE(isMuted);
+
+  ASSERT_EQ(sound_manager_set_muteall(true), 0);
+  ASSERT_EQ(sound_manager_set_muteall(true), 0);
+  EXPECT_EQ(listener.mutes.Take(), true);
+  EXPECT_THAT(Pactl({"get-sink-mute", "first"}), testing::HasSubstr("yes"));
+  Pactl({"set-sink-mute", "first", "0"});
+  EXPECT_EQ(listener.mutes.Take(), false);
+
+  Pactl({"load-module", "module-null-sink", "sink_name=second"});
+  Pactl({"set-sink-mute", "second", "1"});
+  Pactl({"set-default-sink", "second"});
+  EXPECT_EQ(listener.mutes.Take(), true);
+  ASSERT_EQ(sound_manager_set_muteall(false), 0);
+  EXPECT_EQ(listener.mutes.Take(), false);
+  EXPECT_THAT(Pactl({"get-sink-mute", "second"}), testing::HasSubstr("no"));
+}
+
+TEST_F(SoundManagerDesktop, CallsOfOtherProcessesInterruptOnceAltogether) {
+  Listener listener;
+  const Player music({Role("music")});
+  OtherCall first;
+  EXPECT_EQ(listener.interruptions.Take(), 5);
+  OtherCall second;
+  Player alarm({Role("alarm")});
+  EXPECT_EQ(first.Finish(), 0);
+  alarm.Kill();
+  second.Kill();
+  EXPECT_EQ(listener.interruptions.Take(), 0);
+
+  Player otherAlarm({Role("alarm")});
+  EXPECT_EQ(listener.interruptions.Take(), 6);
+  otherAlarm.Kill();
+  EXPECT_EQ(listener.interruptions.Take(), 0);
+}
+
+TEST_F(SoundManagerDesktop, CallThatRunsAlreadyIsReportedToEachWhoRegisters) {
+  OtherCall call;
+  for (int time = 0; time < 2; ++time) {
+    Listener listener;
+    EXPECT_EQ(listener.interruptions.Take(), 5);
+  }
+  Listener listener;
+  EXPECT_EQ(listener.interruptions.Take(), 5);
+  EXPECT_EQ(call.Finish(), 0);
+  EXPECT_EQ(listener.interruptions.Take(), 0);
+}
+
+TEST_F(SoundManagerDesktop, MutedCallIsNoInterruption) {
+  Listener listener;
+  const Player call({Role("phone")});
+  EXPECT_EQ(listener.interruptions.Take(), 5);
+  Pactl({"set-sink-input-mute", std::to_string(call.GetIndex()), "1"});
+  EXPECT_EQ(listener.interruptions.Take(), 0);
+  Pactl({"set-sink-input-mute", std::to_string(call.GetIndex()), "0"});
+  EXPECT_EQ(listener.interruptions.Take(), 5);
+}
+
+TEST_F(SoundManagerDesktop, WhatIsTakenAwayDisrupts) {
+  // pacat in the place of one of this process's players.
+  const std::vector<std::string> asPlayer = {
+      Role("music"), "application.process.id=" + std::to_string(getpid()), "zelkora.player=1"};
+  Listener listener;
+  {
+    const Player player(asPlayer);
+    KillStream(player.GetIndex());
+    EXPECT_EQ(listener.interruptions.Take(), 1);
+  }
+  Player player(asPlayer);
+  Pactl({"suspend-sink", "first", "1"});
+  EXPECT_EQ(listener.interruptions.Take(), 1);
+  Pactl({"suspend-sink", "first", "0"});
+
+  Pactl({"load-module", "module-null-sink", "sink_name=second"});
+  Pactl({"unload-module", "0"});  // the first sink; the stream goes over to the second
+  EXPECT_EQ(listener.interruptions.Take(), 3);
+}
+
+TEST_F(SoundManagerDesktop, OpenCallHoldsItsRoleAndShowsItsModeAndIsNoInterruption) {
+  Listener listener;
+  sound_call_session_h call = nullptr;
+  EXPECT_EQ(sound_manager_call_session_create(0, &call), -22);
+  ASSERT_EQ(sound_manager_call_session_create(1, &call), 0);
+  const char* const kModes[] = {"voice", "ringtone", "media"};
+  for (int mode : {0, 2, 1}) {
+    SCOPED_TRACE(kModes[mode]);
+    ASSERT_EQ(sound_manager_call_session_set_mode(call, mode), 0);
+    int shown = -1;
+    ASSERT_EQ(sound_manager_call_session_get_mode(call, &shown), 0);
+    EXPECT_EQ(shown, mode);
+    const auto streams = ListStreams(RoleLine("phone"));
+    ASSERT_EQ(streams.size(), 1u);
+    EXPECT_FALSE(streams[0].isCorked);
+    EXPECT_THAT(streams[0].description, testing::HasSubstr(kModes[mode]));
+  }
+  EXPECT_EQ(sound_manager_call_session_set_mode(call, 3), -22);
+  ASSERT_EQ(sound_manager_call_session_destroy(call), 0);
+  EXPECT_THAT(ListStreams(RoleLine("phone")), IsEmpty());
+  EXPECT_EQ(sound_manager_call_session_destroy(call), -22);
+  EXPECT_EQ(sound_manager_call_session_set_mode(call, 0), -22);
+
+  Player alarm({Role("alarm")});  // the first that interrupts
+  EXPECT_EQ(listener.interruptions.Take(), 6);
+}
+
+TEST_F(SoundManagerDesktop, CallOfAProcessThatDiesLeavesNothingBehind) {
+  OtherCall call;
+  EXPECT_EQ(ListStreams(RoleLine("phone")).size(), 1u);
+  Listener listener;
+  EXPECT_EQ(listener.interruptions.Take(), 5);
+  call.Kill();
+  EXPECT_EQ(listener.interruptions.Take(), 0);
+  EXPECT_THAT(ListStreams(RoleLine("phone")), IsEmpty());
+}
+
+TEST_F(SoundManagerDesktop, CallbackMayUseTheSoundManagerAndRemoveItself) {
+  static Inbox<int> done;
+  const auto callback = [](int, int level, void*) {
+    done.Put(sound_manager_set_volume(kMedia, level + 1));
+    done.Put(sound_manager_unset_volume_changed_cb());
+  };
+  ASSERT_EQ(sound_manager_set_volume_changed_cb(callback, nullptr), 0);
+  ASSERT_EQ(sound_manager_set_volume(kMedia, 7), 0);
+  EXPECT_EQ(done.Take(), 0);
+  EXPECT_EQ(done.Take(), 0);
+  EXPECT_EQ(GetLevel(kMedia), 8);
+}
+
+TEST_F(SoundManagerDesktop, SessionDecidesTheRoleOfPlayersStreams) {
+  const std::string file = std::string(std::getenv("ZELKORA_TEST_MEDIA")) + "/short.webm";
+  const struct {
+    int type, option;
+    const char* role;
+  } rows[] = {
+      {1, 0, "alarm"}, {2, 0, "notification"}, {3, 0, "alarm"}, {0, 1, "game"}, {0, 0, "music"}};
+  EXPECT_EQ(sound_manager_set_session_type(4), -22);
+  for (const auto& row : rows) {
+    ASSERT_EQ(sound_manager_set_session_type(row.type), 0);
+    ASSERT_EQ(sound_manager_set_media_session_option(row.option, 0), 0);
+    Tizen::Media::Player player;
+    ASSERT_EQ(player.Construct(), E_SUCCESS);
+    ASSERT_EQ(player.OpenFile(file.c_str()), E_SUCCESS);
+    EXPECT_EQ(ListStreams(RoleLine(row.role)).size(), 1u) << row.role;
+  }
+}
+
+/// Runs \p call and expects \p code at once, that is without the bound of a wait that never ends.
+void ExpectSoon(int code, const std::function<int()>& call) {
+  const auto begin = std::chrono::steady_clock::now();
+  EXPECT_EQ(call(), code);
+  EXPECT_LT(std::chrono::steady_clock::now() - begin, std::chrono::seconds(3));
+}
+
+/// Every call that needs the server.
+void ExpectAll(int code) {
+  int level = 0;
+  bool isMuted = false;
+  sound_call_session_h call = nullptr;
+  ExpectSoon(code, [&] { return sound_manager_get_volume(kMedia, &level); });
+  ExpectSoon(code, [&] { return sound_manager_set_volume(kMedia, 7); });
+  ExpectSoon(code, [&] { return sound_manager_get_muteall(&isMuted); });
+  ExpectSoon(code, [&] { return sound_manager_set_muteall(true); });
+  ExpectSoon(code, [&] { return sound_manager_call_session_create(1, &call); });
+}
+
+TEST(SoundServerFaults, WithoutAServerCallsFailAndWorkWhenItComes) {
+  SoundServer server;
+  Listener listener;
+  ExpectAll(-111);
+  server.Start();
+  listener.TakeChanges();  // from those of the server before
+  EXPECT_EQ(sound_manager_set_volume(kMedia, 7), 0);
+  EXPECT_THAT(listener.TakeChanges(), ElementsAre(Change{kMedia, 7}));
+}
+
+TEST(SoundServerFaults, CallbacksReportAgainByThemselvesWhenTheServerIsBack) {
+  SoundServer server;
+  server.Start();
+  Listener listener;
+  ASSERT_EQ(sound_manager_set_volume(kMedia, 4), 0);
+  EXPECT_EQ(listener.volumes.Take(), (Change{kMedia, 4}));
+  const Player call({Role("phone")});
+  EXPECT_EQ(listener.interruptions.Take(), 5);
+  server.Kill();
+  EXPECT_EQ(listener.interruptions.Take(), 4);
+  server.ForgetVolumes();
+
+  server.Start();
+  EXPECT_EQ(listener.volumes.Take(), (Change{kMedia, kMax}));
+  const Player secondCall({Role("phone")});
+  EXPECT_EQ(listener.interruptions.Take(), 5);
+}
+
+TEST(SoundServerFaults, OpenCallIsOpenedAgainByItself) {
+  SoundServer server;
+  server.Start();
+  sound_call_session_h call = nullptr;
+  ASSERT_EQ(sound_manager_call_session_create(1, &call), 0);
+  ASSERT_EQ(sound_manager_call_session_set_mode(call, 2), 0);
+  server.Kill();
+  ExpectSoon(-111, [&] { return sound_manager_call_session_set_mode(call, 1); });
+  server.Start();
+  ASSERT_EQ(sound_manager_call_session_set_mode(call, 2), 0);
+  EXPECT_EQ(ListStreams(RoleLine("phone")).size(), 1u);
+  server.Kill();
+  EXPECT_EQ(sound_manager_call_session_destroy(call), 0);
+  server.Start();
+  EXPECT_EQ(GetLevel(kMedia), kMax);
+  EXPECT_THAT(ListStreams(RoleLine("phone")), IsEmpty());
+}
+
+TEST(SoundServerFaults, ServerThatDoesNotAnswerIsATimeOut) {
+  SoundServer server;
+  server.Start();
+  GetLevel(kMedia);
+  server.Signal(SIGSTOP);
+  ExpectSoon(-110, [] { return sound_manager_set_volume(kMedia, 5); });
+  ExpectSoon(-110, [] { return sound_manager_set_muteall(true); });
+  server.Signal(SIGCONT);
+  EXPECT_EQ(sound_manager_set_volume(kMedia, 5), 0);
+  EXPECT_EQ(GetLevel(kMedia), 5);
+}
+
+TEST(SoundServerFaults, ServerThatIsStoppedWhileConnectingIsATimeOut) {
+  SoundServer server;
+  server.Start();
+  server.Signal(SIGSTOP);
+  int level = 0;
+  ExpectSoon(-110, [&] { return sound_manager_get_volume(kMedia, &level); });
+  server.Signal(SIGCONT);
+  EXPECT_EQ(GetLevel(kMedia), kMax);
+}
+
+TEST(SoundServerFaults, WithoutStoredVolumesLevelsAreRefusedUntilThereAre) {
+  SoundServer server({"module-null-sink sink_name=first"});
+  server.Start();
+  int level = 0;
+  EXPECT_EQ(sound_manager_set_volume(kMedia, 7), -38);
+  EXPECT_EQ(sound_manager_get_volume(kMedia, &level), -38);
+  EXPECT_EQ(sound_manager_set_muteall(true), 0);
+  Pactl({"load-module", "module-stream-restore"});
+  Listener listener;
+  ASSERT_EQ(sound_manager_set_volume(kMedia, 7), 0);
+  const Player music({Role("music")});
+  Pactl({"set-sink-input-volume", std::to_string(music.GetIndex()), "20%"});
+  EXPECT_EQ(listener.volumes.Take(), (Change{kMedia, 7}));
+  EXPECT_EQ(listener.volumes.Take(), (Change{kMedia, 3}));
+}
+
+TEST(SoundServerFaults, WithoutASinkMuteAndCallsAreRefusedUntilThereIsOne) {
+  SoundServer server({"module-stream-restore"});
+  server.Start();
+  sound_call_session_h call = nullptr;
+  bool isMuted = false;
+  EXPECT_EQ(sound_manager_set_muteall(true), -38);
+  EXPECT_EQ(sound_manager_get_muteall(&isMuted), -38);
+  EXPECT_EQ(sound_manager_call_session_create(1, &call), -38);
+  EXPECT_EQ(sound_manager_set_volume(kMedia, 7), 0);
+  Pactl({"load-module", "module-null-sink"});
+  EXPECT_EQ(sound_manager_set_muteall(true), 0);
+  EXPECT_EQ(sound_manager_call_session_create(1, &call), 0);
+  EXPECT_EQ(sound_manager_call_session_destroy(call), 0);
+}
+
+struct Footprint {
+  std::ptrdiff_t files;
+  std::ptrdiff_t threads;
+  std::size_t bytes;
+
+  static Footprint Take() {
+    const auto count = [](const char* directory) {
+      return std::distance(std::filesystem::directory_iterator(directory), {});
+    };
+    return {count("/proc/self/fd"), count("/proc/self/task"), mallinfo2().uordblks};
+  }
+};
+
+TEST(SoundServerFaults, HundredDeathsOfTheServerLeaveNothingBehind) {
+  constexpr int kWarmUp = 10;
+  constexpr int kDeaths = 100;
+  constexpr std::size_t kNoise = 64 * 1024;  // buffers that libpulse and the C library keep
+  SoundServer server;
+  server.Start();
+  Listener listener;
+  sound_call_session_h call = nullptr;
+  ASSERT_EQ(sound_manager_call_session_create(1, &call), 0);
+  Footprint before = {};
+  for (int i = 0; i < kWarmUp + kDeaths; ++i) {
+    SCOPED_TRACE(i);
+    if (i == kWarmUp) before = Footprint::Take();
+    std::thread user([] {
+      while (sound_manager_set_volume(kMedia, rand() % kMax) == 0) {
+      }
+    });
+    server.Kill();
+    user.join();
+    ASSERT_EQ(listener.interruptions.Take(), 4);
+    server.Start();
+    const auto begin = std::chrono::steady_clock::now();
+    ASSERT_EQ(sound_manager_call_session_set_mode(call, i % 3), 0);
+    ASSERT_EQ(sound_manager_set_volume(kMedia, i % 2), 0);
+    ASSERT_LT(std::chrono::steady_clock::now() - begin, std::chrono::seconds(2));
+    listener.TakeChanges();
+  }
+  const Footprint after = Footprint::Take();
+  EXPECT_EQ(after.files, before.files);
+  EXPECT_EQ(after.threads, before.threads);
+  EXPECT_LE(after.bytes, before.bytes + kNoise);
+  ASSERT_EQ(sound_manager_call_session_destroy(call), 0);
+}
+
+/// Hears levels through the library.
+class MediaLevels : public Zelkora::Media::IAudioVolumeEventListener {
+ public:
+  void OnMediaVolumeChanged(int level) override { levels.Put(level); }
+  Inbox<int> levels;
+};
+
+class Interruptions : public Zelkora::Media::IAudioSessionEventListener {
+ public:
+  void OnAudioSessionInterruptStarted() override { events.Put("started"); }
+  void OnAudioSessionInterruptFinished() override { events.Put("finished"); }
+  void OnAudioSessionDisrupted() override { events.Put("disrupted"); }
+  Inbox<std::string> events;
+};
+
+/// Uses all managers on one server after the other, and leaves them and their listeners alive.
+void UseTheLibraryAndExit() {
+  using namespace Zelkora::Media;
+  static SoundServer server;
+  static MediaLevels volumes;
+  static Interruptions interruptions;
+  AudioVolumeManager* volume = AudioVolumeManager::GetInstance();  // there is no server yet
+  AudioSessionManager* session = AudioSessionManager::GetInstance();
+  VoipAudioSessionManager* call = VoipAudioSessionManager::GetInstance();
+  bool good = volume->AddAudioVolumeEventListener(volumes) == E_SUCCESS &&
+              session->SetAudioSessionEventListener(&interruptions) == E_SUCCESS &&
+              volume->SetMediaVolumeLevel(3) == E_SYSTEM && call->EnterCallSession() == E_SYSTEM;
+  for (int i = 0; i < 2; ++i) {
+    server.Start();
+    if (i == 1) good = good && volumes.levels.Take() == kMax;  // by itself
+    good = good && volume->SetMediaVolumeLevel(3) == E_SUCCESS && volumes.levels.Take() == 3;
+    Player alarm({Role("alarm")});
+    good = good && interruptions.events.Take() == "started";
+    alarm.Kill();
+    good = good && interruptions.events.Take() == "finished";
+    good = good && call->EnterCallSession() == (i == 0 ? E_SUCCESS : E_INVALID_OPERATION);
+    if (i == 0) {
+      server.Kill();
+      server.ForgetVolumes();
+      good = good && interruptions.events.Take() == "disrupted";
+    }
+  }
+  std::exit(good ? 0 : 1);
+}
+
+TEST(SoundServerFaultsDeathTest, LibraryOutlivesTheServerAndTheProcessEndsCleanly) {
+  GTEST_FLAG_SET(death_test_style, "threadsafe");
+  EXPECT_EXIT(UseTheLibraryAndExit(), testing::ExitedWithCode(0), "");
+}
+
+/// The other process of `OtherCall`.
+int HoldCall() {
+  sound_call_session_h call = nullptr;
+  if (sound_manager_call_session_create(1, &call) != 0) return 1;
+  std::puts("open");
+  std::fflush(stdout);
+  while (std::getchar() != EOF) {
+  }
+  return sound_manager_call_session_destroy(call) == 0 ? 0 : 1;
+}
+
+}  // namespace
+
+int main(int count, char** arguments) {
+  if (count > 1 && std::string(arguments[1]) == "--call") return HoldCall();
+  testing::InitGoogleMock(&count, arguments);
+  return RUN_ALL_TESTS();
+}

@@ -1,10 +1,9 @@
 #include "DeviceLog.h"
 
-#include <Host/Log.h>
-
 #include <cstdio>
 #include <cstring>
 #include <mutex>
+#include <utility>
 
 namespace CommandLine::DeviceLog {
 namespace {
@@ -41,9 +40,18 @@ bool IsFromDevice(const Host::LogRecord& record) {
   return record.hasResult && record.module != 0 && record.module != kLibraryModule;
 }
 
-void Receive(const Host::LogRecord& record, void* verbose) {
+bool verboseOutput = false;  // these two change only while no line is received
+Show shown;
+
+void Receive(const Host::LogRecord& record, void*) noexcept {
   if (IsFromDevice(record)) Remember(record);
-  if (verbose != nullptr || record.level == Host::LogLevel::kAssertion) WriteLine(record);
+  try {
+    if (shown) return shown(record);
+  } catch (...) {
+    // Nobody reads; the command itself finds out.
+    return;
+  }
+  if (verboseOutput || record.level == Host::LogLevel::kAssertion) WriteLine(record);
 }
 
 /// \return \p text behind the first \p end when it begins with \p begin.
@@ -58,8 +66,16 @@ const char* ReasonIn(const char* message) { return Skip(Skip(message, '[', "] ")
 }  // namespace
 
 void Install(bool verbose) {
-  static bool on = true;
-  Host::SetLogSink(Receive, verbose ? &on : nullptr);
+  verboseOutput = verbose;
+  Host::SetLogSink(Receive, nullptr);
+}
+
+bool IsVerbose() { return verboseOutput; }
+
+void ShowWith(Show show) {
+  Host::SetLogSink(nullptr, nullptr);
+  shown = std::move(show);
+  Host::SetLogSink(Receive, nullptr);
 }
 
 std::string TakeReason(result r) {

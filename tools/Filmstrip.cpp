@@ -1,7 +1,6 @@
 #include "Filmstrip.h"
 
 #include "Failure.h"
-#include "OutputFile.h"
 
 #include <fmt/format.h>
 
@@ -25,31 +24,8 @@ constexpr double kCornerRadius = 4;
 
 constexpr std::size_t kLongestRow = 6;  // in thumbnails, until a square has longer ones
 
-struct Color {
-  double red, green, blue;
-};
 constexpr Color kBackground{0.086, 0.094, 0.114};
 constexpr Color kText{0.78, 0.80, 0.84};
-
-struct ContextDeleter {
-  void operator()(cairo_t* context) const { cairo_destroy(context); }
-};
-using Context = std::unique_ptr<cairo_t, ContextDeleter>;
-
-void CheckCairo(cairo_status_t status) {
-  if (status == CAIRO_STATUS_SUCCESS) return;
-  throw Failure(fmt::format("cannot draw the picture: {}", cairo_status_to_string(status)));
-}
-
-Context NewContext(cairo_surface_t* surface) {
-  Context context(cairo_create(surface));
-  CheckCairo(cairo_status(context.get()));
-  return context;
-}
-
-void SetColor(cairo_t* context, Color color) {
-  cairo_set_source_rgb(context, color.red, color.green, color.blue);
-}
 
 Filmstrip::Size ThumbnailSize(const VideoFrame& frame) {
   const double scale = double(kThumbnailSize) / std::max(frame.width, frame.height);
@@ -107,21 +83,8 @@ void DrawCaption(cairo_t* context, const std::string& text, double center, doubl
   cairo_show_text(context, text.c_str());
 }
 
-cairo_status_t WriteBytes(void* file, const unsigned char* data, unsigned size) {
-  return static_cast<OutputFile*>(file)->Write(data, size) ? CAIRO_STATUS_SUCCESS
-                                                           : CAIRO_STATUS_WRITE_ERROR;
-}
-
-}  // namespace
-
-Filmstrip::Surface Filmstrip::NewSurface(Size size) {
-  Surface surface(cairo_image_surface_create(CAIRO_FORMAT_RGB24, size.width, size.height));
-  CheckCairo(cairo_surface_status(surface.get()));
-  return surface;
-}
-
-Filmstrip::Surface Filmstrip::SurfaceOf(const VideoFrame& frame) {
-  Surface surface = NewSurface({frame.width, frame.height});
+Surface SurfaceOf(const VideoFrame& frame) {
+  Surface surface = NewImage(frame.width, frame.height);
   const unsigned char* from = frame.pixels.data();
   for (int row = 0; row < frame.height; ++row) {
     unsigned char* to = cairo_image_surface_get_data(surface.get()) +
@@ -135,10 +98,12 @@ Filmstrip::Surface Filmstrip::SurfaceOf(const VideoFrame& frame) {
   return surface;
 }
 
+}  // namespace
+
 void Filmstrip::Add(const VideoFrame& frame, long position) {
   const Size size = ThumbnailSize(frame);
   const Surface full = SurfaceOf(frame);
-  Surface small = NewSurface(size);
+  Surface small = NewImage(size.width, size.height);
   const Context context = NewContext(small.get());
   cairo_scale(context.get(), double(size.width) / frame.width, double(size.height) / frame.height);
   cairo_set_source_surface(context.get(), full.get(), 0, 0);
@@ -154,7 +119,7 @@ Filmstrip::Size Filmstrip::Write(OutputFile& file) const {
   const int cellWidth = largest_.width + kMargin;
   const int cellHeight = largest_.height + kCaptionHeight + kMargin;
   const Size size{int(grid.columns) * cellWidth + kMargin, int(grid.rows) * cellHeight + kMargin};
-  const Surface picture = NewSurface(size);
+  const Surface picture = NewImage(size.width, size.height);
   const Context context = NewContext(picture.get());
   SetColor(context.get(), kBackground);
   cairo_paint(context.get());
@@ -169,9 +134,7 @@ Filmstrip::Size Filmstrip::Write(OutputFile& file) const {
     DrawCaption(context.get(), thumbnails_[i].time, center, y + largest_.height + kCaptionBaseline);
   }
   CheckCairo(cairo_status(context.get()));
-  const cairo_status_t status = cairo_surface_write_to_png_stream(picture.get(), WriteBytes, &file);
-  if (status != CAIRO_STATUS_WRITE_ERROR) CheckCairo(status);
-  file.Complete();
+  WritePng(picture.get(), file);
   return size;
 }
 

@@ -1,10 +1,9 @@
 #pragma once
 
+#include "Drawing.h"
+
 #include <Tizen/Media/Player.h>
 
-#include <cairo.h>
-
-#include <memory>
 #include <string>
 #include <vector>
 
@@ -30,18 +29,10 @@ class Filmstrip {
   Size Write(OutputFile& file) const;
 
  private:
-  struct Deleter {
-    void operator()(cairo_surface_t* surface) const { cairo_surface_destroy(surface); }
-  };
-  using Surface = std::unique_ptr<cairo_surface_t, Deleter>;
-
   struct Thumbnail {
     Surface picture;
     std::string time;
   };
-
-  static Surface NewSurface(Size size);
-  static Surface SurfaceOf(const Tizen::Media::VideoFrame& frame);
 
   std::vector<Thumbnail> thumbnails_;
   Size largest_{96, 0};  // of the thumbnails, and wide enough for a time

@@ -51,9 +51,11 @@ void AddOptions(CLI::App& program, Request& request) {
   program.get_formatter()->label("SUBCOMMAND", "COMMAND");
   program.require_subcommand(0, 1);
   program.fallthrough();  // these options are understood behind a command too
-  AddDevicesCommand(program, request.command);
-  AddFilmstripCommand(program, request.command);
-  AddSeekCommand(program, request.command);
+  for (auto add : {AddCallCommand, AddDevicesCommand, AddEffectsCommand, AddFilmstripCommand,
+                   AddMonitorCommand, AddMuteCommand, AddSeekCommand, AddSessionCommand,
+                   AddShellCommand, AddVolumeCommand}) {
+    add(program, request.command);
+  }
   for (CLI::App* command : program.get_subcommands(nullptr)) command->group("Commands");
 }
 

@@ -8,20 +8,12 @@
 #include <Zelkora/Media/AudioEffector.h>
 
 #include <climits>
-#include <string>
-#include <vector>
-
-using Lines = std::vector<std::string>;
 
 inline constexpr char kNotYet[] = "Not yet constructed! Construct() should be called before use";
 inline constexpr char kUnknownEffect[] =
     "[E_INVALID_ARG] Invalid argument is used. Unsupported Audio Effect type.";
 inline constexpr char kUnknownPreset[] =
     "[E_INVALID_ARG] Invalid argument is used. Unsupported Audio Preset type.";
-
-inline std::string Bracketed(result r, const std::string& message) {
-  return std::string("[") + GetErrorMessage(r) + "] " + message;
-}
 
 /// What the operations that give a list call and log.
 struct ListTexts {
@@ -37,7 +29,7 @@ struct ListTexts {
   }
   std::string Failure(result r) const {
     return App(Signature("_AudioEffectorImpl"),
-               Bracketed(r, "Failed to perform " + function + " operation."));
+               Named(r, " Failed to perform " + function + " operation."));
   }
   std::string Unknown() const {
     return App("static bool Zelkora::Media::_AudioEffectorImpl::" + callback, unknown);
@@ -56,21 +48,12 @@ class EffectorTest : public LibraryTest {
  protected:
   EffectorTest() {
     EXPECT_EQ(player.Construct(), E_SUCCESS);
-    Host::RecordCalls(true);
+    Forget();
   }
 
   void Construct() {
     ASSERT_EQ(effector.Construct(player), E_SUCCESS);
-    Host::TakeCalls();
-  }
-
-  /// Expects what was left behind since the last call: last result, the log, the platform's calls.
-  void ExpectLeft(result last, const Lines& lines, const Lines& calls,
-                  int line = __builtin_LINE()) {
-    testing::ScopedTrace trace(__FILE__, line, "called from this line of the test");
-    EXPECT_STREQ(GetErrorMessage(GetLastResult()), GetErrorMessage(last));
-    EXPECT_THAT(log.Take(), testing::ElementsAreArray(lines));
-    EXPECT_THAT(Host::TakeCalls(), testing::ElementsAreArray(calls));
+    Forget();
   }
 
   Tizen::Media::Player player;

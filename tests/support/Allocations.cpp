@@ -11,9 +11,7 @@ thread_local std::size_t count = 0;
 thread_local std::size_t untilFailure = 0;  // 0: none fails
 thread_local bool failed = false;
 
-constexpr std::size_t kNone = 0;
-constexpr std::size_t kAll = SIZE_MAX;
-std::atomic<std::size_t> untilLibraryFailure{kNone};  // the library's are those that don't throw
+std::atomic<std::ptrdiff_t> librarySpared{PTRDIFF_MAX};  // the library's are those that don't throw
 std::atomic<std::ptrdiff_t> live{0};
 
 void* Allocate(std::size_t size) {
@@ -26,15 +24,9 @@ void* Allocate(std::size_t size) {
   return std::malloc(size);
 }
 
-bool IsLibraryToFail() {
-  std::size_t left = untilLibraryFailure;
-  while (left != kNone && left != kAll) {
-    if (untilLibraryFailure.compare_exchange_weak(left, left - 1)) return left == 1;
-  }
-  return left == kAll;
+void* AllocateOrNull(std::size_t size) {
+  return librarySpared.fetch_sub(1) > 0 ? Allocate(size) : nullptr;
 }
-
-void* AllocateOrNull(std::size_t size) { return IsLibraryToFail() ? nullptr : Allocate(size); }
 
 void Free(void* memory) {
   if (memory != nullptr) live.fetch_sub(1, std::memory_order_relaxed);
@@ -75,8 +67,8 @@ FailingAllocation::~FailingAllocation() { untilFailure = 0; }
 
 bool FailingAllocation::HasFailed() const { return failed; }
 
-FailingLibraryAllocation::FailingLibraryAllocation(std::size_t nth) {
-  untilLibraryFailure = nth == 0 ? kAll : nth;
+FailingLibraryAllocation::FailingLibraryAllocation(std::ptrdiff_t spared) {
+  librarySpared = spared;
 }
 
-FailingLibraryAllocation::~FailingLibraryAllocation() { untilLibraryFailure = kNone; }
+FailingLibraryAllocation::~FailingLibraryAllocation() { librarySpared = PTRDIFF_MAX; }

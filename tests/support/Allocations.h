@@ -22,11 +22,11 @@ class FailingAllocation {
   bool HasFailed() const;
 };
 
-/// Makes one of the library's own allocations fail while it lives, or all of them, on any thread.
-/// The library alone allocates without throwing.
+/// Makes the library's own allocations fail while it lives, on any thread. The library alone
+/// allocates without throwing.
 class FailingLibraryAllocation {
  public:
-  /// \param nth which allocation from now on, the next being 1; 0 for every one
-  explicit FailingLibraryAllocation(std::size_t nth = 0);
+  /// \param spared how many still succeed
+  explicit FailingLibraryAllocation(std::ptrdiff_t spared = 0);
   ~FailingLibraryAllocation();
 };

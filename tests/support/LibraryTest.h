@@ -8,18 +8,60 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-/// A test of the library on a fresh simulated device, with the log captured and assertions
-/// returning.
+#include <algorithm>
+
+/// The last result before each operation.
+inline constexpr result kUntouched = 0xBEEF;
+
+/// A result that has no name.
+inline constexpr result kForeign = 0xA0001234;
+
+/// \return the text with the result's name in brackets in front, as "[%s]..." is filled.
+inline std::string Named(result r, const std::string& text) {
+  return "[" + std::string(GetErrorMessage(r)) + "]" + text;
+}
+
+/// What comes of the answers to a feature query.
+inline constexpr struct {
+  result answer, expected;
+} kFeatureRefusals[] = {{Host::kFeatureAbsent, E_UNSUPPORTED_OPERATION},
+                        {E_OBJ_NOT_FOUND, E_UNSUPPORTED_OPERATION},
+                        {E_SYSTEM, E_SYSTEM},
+                        {kForeign, kForeign}};
+
+/// A test of the library on a fresh simulated device, with log and platform calls captured and
+/// assertions returning.
 class LibraryTest : public testing::Test {
  protected:
   LibraryTest() {
     Simulated::Reset();
     Host::SetAssertionAction(Host::AssertionAction::kReturn);
-    ClearLastResult();
+    Forget();
   }
   ~LibraryTest() override {
     Simulated::WaitUntilDelivered();  // lest the next test hears it
     Simulated::Reset();
+  }
+
+  /// Begins afresh what `ExpectLeft` sees.
+  void Forget() {
+    log.Take();
+    Host::RecordCalls(true);
+    SetLastResult(kUntouched);
+  }
+
+  /// Expects what was left behind since the last time: last result, log and platform calls, but for
+  /// those by which the device's thread passes a change on.
+  void ExpectLeft(result last, const Lines& lines, const Lines& calls,
+                  int line = __builtin_LINE()) {
+    testing::ScopedTrace trace("", line, "what was left behind");
+    EXPECT_STREQ(GetErrorMessage(GetLastResult()), GetErrorMessage(last));
+    Simulated::WaitUntilDelivered();
+    EXPECT_THAT(log.Take(), testing::ElementsAreArray(lines));
+    Lines made = Host::TakeCalls();
+    made.erase(std::remove(made.begin(), made.end(), "_Event::FireAsync()"), made.end());
+    EXPECT_THAT(made, testing::ElementsAreArray(calls));
+    SetLastResult(kUntouched);
   }
 
   LogCapture log;

@@ -29,7 +29,7 @@ void LogCapture::Receive(const Host::LogRecord& record, void* context) {
   capture.lines_.push_back(std::move(text));
 }
 
-std::vector<std::string> LogCapture::Take() {
+Lines LogCapture::Take() {
   std::lock_guard lock(mutex_);
   return std::exchange(lines_, {});
 }

@@ -8,6 +8,8 @@
 #include <string>
 #include <vector>
 
+using Lines = std::vector<std::string>;
+
 /// Collects what the library logs while it lives; lines of the device itself are left out.
 class LogCapture {
  public:
@@ -16,13 +18,13 @@ class LogCapture {
 
   /// \return the lines since the last call, in order, as `Sys`, `SysPlain`, `App` and their like
   /// write them.
-  std::vector<std::string> Take();
+  Lines Take();
 
  private:
   static void Receive(const Host::LogRecord& record, void* context);
 
   std::mutex mutex_;
-  std::vector<std::string> lines_;
+  Lines lines_;
 };
 
 /// A line of the platform family's exception log: module 80, no function name.

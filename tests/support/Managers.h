@@ -2,19 +2,18 @@
 /// The three managers as tables: what tells them apart, and each of their operations as a row.
 #pragma once
 
-#include "LogCapture.h"
+#include "LibraryTest.h"
 
 #include <Zelkora/Media/AudioSessionManager.h>
 #include <Zelkora/Media/AudioVolumeManager.h>
+#include <Zelkora/Media/IAudioSessionEventListener.h>
 #include <Zelkora/Media/IAudioVolumeEventListener.h>
 #include <Zelkora/Media/VoipAudioSessionManager.h>
 
-#include <gtest/gtest.h>
-
 #include <functional>
-#include <string>
 #include <type_traits>
-#include <vector>
+
+namespace Zelkora::Media {
 
 /// An operation of a manager. Called one after the other, all of a manager's operations succeed.
 template <typename Manager>
@@ -41,18 +40,20 @@ Operation<Manager> Row(const std::string& name, const std::string& platformCall,
           }};
 }
 
-using Volume = Zelkora::Media::AudioVolumeManager;
+using Session = AudioSessionManager;
+using Call = VoipAudioSessionManager;
+using Volume = AudioVolumeManager;
 
 /// A sound category of the volume manager.
 struct SoundCategory {
-  const char* name;
+  std::string name;
   int soundType;
   result (Volume::*getRange)(int&, int&) const;
   result (Volume::*setLevel)(int);
   int (Volume::*getLevel)() const;
 };
 
-inline constexpr SoundCategory kSoundCategories[] = {
+inline const SoundCategory kSoundCategories[] = {
     {"System", 0, &Volume::GetSystemVolumeRange, &Volume::SetSystemVolumeLevel,
      &Volume::GetCurrentSystemVolumeLevel},
     {"Notification", 1, &Volume::GetNotificationVolumeRange, &Volume::SetNotificationVolumeLevel,
@@ -72,42 +73,40 @@ template <typename Manager>
 struct Facts;
 
 template <>
-struct Facts<Zelkora::Media::AudioSessionManager> {
-  using Manager = Zelkora::Media::AudioSessionManager;
+struct Facts<Session> {
   static constexpr char kName[] = "AudioSessionManager";
   static constexpr char kPrivilege[] = "audiomanager.session";
   static constexpr char kManagerNotCreated[] = "  The object is not created.";
-  static std::vector<std::string> Callbacks() { return {"session_interrupted"}; }
+  static Lines Callbacks() { return {"session_interrupted"}; }
 
-  static std::vector<Operation<Manager>> Operations() {
+  static std::vector<Operation<Session>> Operations() {
     return {
-        Row<Manager>("SetAudioSessionEventListener", "", &Manager::SetAudioSessionEventListener,
+        Row<Session>("SetAudioSessionEventListener", "", &Session::SetAudioSessionEventListener,
                      nullptr),
-        Row<Manager>("SetMode", "sound_manager_set_session_type(1)", &Manager::SetMode,
-                     Zelkora::Media::AUDIO_SESSION_MODE_ALARM),
-        Row<Manager>("GetMode", "sound_manager_get_session_type()", &Manager::GetMode),
+        Row<Session>("SetMode", "sound_manager_set_session_type(1)", &Session::SetMode,
+                     AUDIO_SESSION_MODE_ALARM),
+        Row<Session>("GetMode", "sound_manager_get_session_type()", &Session::GetMode),
     };
   }
 };
 
 template <>
-struct Facts<Zelkora::Media::VoipAudioSessionManager> {
-  using Manager = Zelkora::Media::VoipAudioSessionManager;
+struct Facts<Call> {
   static constexpr char kName[] = "VoipAudioSessionManager";
   static constexpr char kPrivilege[] = "audiomanager.voipsession";
   static constexpr char kManagerNotCreated[] = "\tThe object is not created.";
-  static std::vector<std::string> Callbacks() { return {}; }
+  static Lines Callbacks() { return {}; }
 
-  static std::vector<Operation<Manager>> Operations() {
+  static std::vector<Operation<Call>> Operations() {
     return {
-        Row<Manager>("EnterCallSession", "sound_manager_call_session_create(1)",
-                     &Manager::EnterCallSession),
-        Row<Manager>("SetCallSessionMode", "sound_manager_call_session_set_mode(1, 2)",
-                     &Manager::SetCallSessionMode, Zelkora::Media::VOIP_AUDIO_SESSION_MODE_MEDIA),
-        Row<Manager>("GetCallSessionMode", "sound_manager_call_session_get_mode(1)",
-                     &Manager::GetCallSessionMode),
-        Row<Manager>("ExitCallSession", "sound_manager_call_session_destroy(1)",
-                     &Manager::ExitCallSession),
+        Row<Call>("EnterCallSession", "sound_manager_call_session_create(1)",
+                  &Call::EnterCallSession),
+        Row<Call>("SetCallSessionMode", "sound_manager_call_session_set_mode(1, 2)",
+                  &Call::SetCallSessionMode, VOIP_AUDIO_SESSION_MODE_MEDIA),
+        Row<Call>("GetCallSessionMode", "sound_manager_call_session_get_mode(1)",
+                  &Call::GetCallSessionMode),
+        Row<Call>("ExitCallSession", "sound_manager_call_session_destroy(1)",
+                  &Call::ExitCallSession),
     };
   }
 };
@@ -117,10 +116,10 @@ struct Facts<Volume> {
   static constexpr char kName[] = "AudioVolumeManager";
   static constexpr char kPrivilege[] = "audiomanager.volume";
   static constexpr char kManagerNotCreated[] = "  The object is not created.";
-  static std::vector<std::string> Callbacks() { return {"volume_changed", "muteall_changed"}; }
+  static Lines Callbacks() { return {"volume_changed", "muteall_changed"}; }
 
   static std::vector<Operation<Volume>> Operations() {
-    static Zelkora::Media::IAudioVolumeEventListener listener;
+    static IAudioVolumeEventListener listener;
     std::vector<Operation<Volume>> rows = {
         Row<Volume>("AddAudioVolumeEventListener", "_Event::AddListener()",
                     &Volume::AddAudioVolumeEventListener, std::ref(listener)),
@@ -130,24 +129,21 @@ struct Facts<Volume> {
         Row<Volume>("UnmuteAll", "sound_manager_set_muteall(false)", &Volume::UnmuteAll),
         Row<Volume>("GetMuteStatus", "sound_manager_get_muteall()", &Volume::GetMuteStatus),
     };
-    for (const SoundCategory& category : kSoundCategories) {
-      const std::string name = category.name;
-      const std::string type = std::to_string(category.soundType);
-      rows.push_back(Row<Volume>("Get" + name + "VolumeRange",
-                                 "sound_manager_get_max_volume(" + type + ")", category.getRange, 7,
-                                 7));
+    for (const auto& [name, soundType, getRange, setLevel, getLevel] : kSoundCategories) {
+      const std::string volume = "volume(" + std::to_string(soundType);
+      const std::string get = "sound_manager_get_";
+      rows.push_back(
+          Row<Volume>("Get" + name + "VolumeRange", get + "max_" + volume + ")", getRange, 7, 7));
       rows.push_back(Row<Volume>("Set" + name + "VolumeLevel",
-                                 "sound_manager_set_volume(" + type + ", 9)", category.setLevel,
-                                 9));
-      rows.push_back(Row<Volume>("GetCurrent" + name + "VolumeLevel",
-                                 "sound_manager_get_volume(" + type + ")", category.getLevel));
+                                 "sound_manager_set_" + volume + ", 9)", setLevel, 9));
+      rows.push_back(
+          Row<Volume>("GetCurrent" + name + "VolumeLevel", get + volume + ")", getLevel));
     }
     return rows;
   }
 };
 
-using Managers = testing::Types<Zelkora::Media::AudioSessionManager,
-                                Zelkora::Media::VoipAudioSessionManager, Volume>;
+using Managers = testing::Types<Session, Call, Volume>;
 
 /// Names typed tests after the manager.
 struct ManagerNames {
@@ -166,9 +162,6 @@ std::string PrivilegeQuery() {
 inline constexpr char kFeatureQuery[] =
     "SystemInfo::GetValue(http://developer.zelkora.example/tizen/feature/audio_manager)";
 
-inline constexpr char kDenied[] =
-    "[E_PRIVILEGE_DENIED] This application does not have the privilege to call this method.";
-
 /// Codes of the sound manager, how "0x%x" prints them, and the results that they stand for.
 inline constexpr struct {
   int code;
@@ -181,9 +174,22 @@ inline constexpr struct {
     {-1, "0xffffffff", E_SYSTEM},
 };
 
-/// \return the text with the result's name in its brackets, as "[%s]..." is filled.
-inline std::string Named(result r, const std::string& text) {
-  return "[" + std::string(GetErrorMessage(r)) + "]" + text;
-}
-
 inline std::string SysNamed(result r, const std::string& text) { return Sys(r, Named(r, text)); }
+
+/// A test of a manager that exists.
+template <typename Manager>
+class ManagerTest : public LibraryTest {
+ protected:
+  ManagerTest() { Forget(); }
+
+  /// Expects what an operation left behind that passed the gate, with its calls behind that.
+  void ExpectLeftBehindGate(result last, const Lines& lines, Lines calls = {},
+                            int line = __builtin_LINE()) {
+    calls.insert(calls.begin(), PrivilegeQuery<Manager>());
+    ExpectLeft(last, lines, calls, line);
+  }
+
+  Manager& manager = *Manager::GetInstance();
+};
+
+}  // namespace Zelkora::Media

@@ -3,11 +3,13 @@
 
 #include <gtest/gtest.h>
 
+#include <pthread.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
 #include <cstdio>
 #include <cstdlib>
+#include <limits>
 
 /// Runs \p body in a process of its own, which then exits as a program does: with its exit handlers
 /// and the sanitizers' verdict. The program must have a single thread; checks within \p body count.
@@ -17,6 +19,7 @@ int StatusOfOwnProcess(Body body) {
   std::fflush(nullptr);
   const pid_t child = fork();
   if (child == 0) {
+    alarm(120);  // a process that hangs is a failure, not a wait
     body();
     std::exit(testing::Test::HasFailure() ? 1 : 0);
   }
@@ -29,4 +32,17 @@ int StatusOfOwnProcess(Body body) {
 template <typename Body>
 void InOwnProcess(Body body) {
   EXPECT_EQ(StatusOfOwnProcess(body), 0);
+}
+
+/// \return what \p function gives while no thread can be started
+template <typename Function>
+auto WithoutThreads(Function function) {
+  pthread_attr_t normal, huge;
+  pthread_getattr_default_np(&normal);
+  pthread_getattr_default_np(&huge);
+  pthread_attr_setstacksize(&huge, std::numeric_limits<std::size_t>::max() / 8 * 7);
+  pthread_setattr_default_np(&huge);
+  const auto given = function();
+  pthread_setattr_default_np(&normal);
+  return given;
 }

@@ -1,112 +1,90 @@
-#include "support/LibraryTest.h"
 #include "support/Managers.h"
 
 #include <climits>
 
+namespace Zelkora::Media {
 namespace {
 
 using testing::ElementsAre;
 using testing::IsEmpty;
-using namespace Zelkora::Media;
 
-constexpr char kNotEntered[] = "[E_INVALID_STATE] EnterCallSession() should be called before use";
-constexpr char kHandle[] =
-    "[E_INVALID_OPERATION] A error has been occurred. The value of __soundCallSessionHandle is ";
+constexpr char kCreate[] = "sound_manager_call_session_create(1)";
+constexpr char kDestroy[] = "sound_manager_call_session_destroy(1)";
+
+const std::string kNotEntered =
+    Sys(E_INVALID_STATE, "[E_INVALID_STATE] EnterCallSession() should be called before use");
+
+std::string Handle(result r, const std::string& what, const std::string& state) {
+  return SysNamed(
+      r,
+      " A " + what + " has been occurred. The value of __soundCallSessionHandle is " + state + ".");
+}
+
+std::string Refused(result r, const std::string& function, const std::string& tail) {
+  return SysNamed(
+      r, " Failed to perform sound_manager_call_session_" + function + " operation" + tail);
+}
 
 VoipAudioSessionMode Mode(int value) { return static_cast<VoipAudioSessionMode>(value); }
 
-class NoCall : public LibraryTest {
+class NoCall : public ManagerTest<Call> {
  protected:
   ~NoCall() override {
     Host::ClearFailures();
     if (!Simulated::GetCallSessionModes().empty()) manager.ExitCallSession();
   }
-
-  void ExpectFailure(result r, const std::string& line) {
-    EXPECT_EQ(GetLastResult(), r);
-    EXPECT_THAT(log.Take(), ElementsAre(Sys(r, line)));
-    ClearLastResult();
-  }
-
-  /// Checks that nothing but the gate was asked since recording began.
-  void ExpectNoPlatformCall() {
-    EXPECT_THAT(Host::TakeCalls(), ElementsAre(PrivilegeQuery<VoipAudioSessionManager>()));
-  }
-
-  VoipAudioSessionManager& manager = *VoipAudioSessionManager::GetInstance();
 };
 
 TEST_F(NoCall, LeavesNothingToExitAndNoModeToSetOrGet) {
-  Host::RecordCalls(true);
   EXPECT_EQ(manager.ExitCallSession(), E_INVALID_OPERATION);
-  ExpectFailure(E_INVALID_OPERATION, kHandle + std::string("null."));
-  ExpectNoPlatformCall();
+  ExpectLeftBehindGate(E_INVALID_OPERATION, {Handle(E_INVALID_OPERATION, "error", "null")});
   for (const int mode : {0, 1, 2, 3, 5, -1}) {  // the state is judged before the argument
     EXPECT_EQ(manager.SetCallSessionMode(Mode(mode)), E_INVALID_STATE);
-    ExpectFailure(E_INVALID_STATE, kNotEntered);
-    ExpectNoPlatformCall();
+    ExpectLeftBehindGate(E_INVALID_STATE, {kNotEntered});
   }
   EXPECT_EQ(manager.GetCallSessionMode(), VOIP_AUDIO_SESSION_MODE_NONE);
-  ExpectFailure(E_INVALID_STATE, kNotEntered);
-  ExpectNoPlatformCall();
+  ExpectLeftBehindGate(E_INVALID_STATE, {kNotEntered});
 }
 
-TEST_F(NoCall, RefusedCreationStaysWithoutACall) {
+TEST_F(NoCall, CreationThatFailsLeavesNeitherACallNorASession) {
+  const auto expectFailure = [this](result r, const std::string& line, const Lines& calls) {
+    EXPECT_EQ(manager.EnterCallSession(), r);
+    ExpectLeftBehindGate(r, {line}, calls);
+    EXPECT_THAT(Simulated::GetCallSessionModes(), IsEmpty());
+    EXPECT_EQ(manager.GetCallSessionMode(), VOIP_AUDIO_SESSION_MODE_NONE);
+    ExpectLeftBehindGate(E_INVALID_STATE, {kNotEntered});
+  };
+  const std::string code = " with error code : ";
   for (const auto& failure : kPlatformFailures) {
-    SCOPED_TRACE(failure.code);
     Host::FailCall("sound_manager_call_session_create", failure.code, 1);
-    EXPECT_EQ(manager.EnterCallSession(), failure.r);
-    EXPECT_EQ(GetLastResult(), failure.r);
-    const auto lines = log.Take();  // its wording is free, but for these
-    ASSERT_EQ(lines.size(), 1u);
-    EXPECT_THAT(lines[0], testing::StartsWith(SysNamed(failure.r, " ")));
-    EXPECT_THAT(lines[0], testing::EndsWith(failure.hex));
-    EXPECT_EQ(manager.ExitCallSession(), E_INVALID_OPERATION);
-    log.Take();
+    expectFailure(failure.r, Refused(failure.r, "create", code + failure.hex), {kCreate});
   }
-  EXPECT_EQ(manager.EnterCallSession(), E_SUCCESS);
-}
-
-TEST_F(NoCall, CreationWithoutASessionIsASystemError) {
   Simulated::SetCallSessionFault(Simulated::CallSessionFault::kNoSession);
-  Host::RecordCalls(true);
-  EXPECT_EQ(manager.EnterCallSession(), E_SYSTEM);
-  ExpectFailure(E_SYSTEM,
-                "[E_SYSTEM] A system error has been occurred. The value of "
-                "__soundCallSessionHandle is null.");
-  EXPECT_THAT(Host::TakeCalls(), ElementsAre(PrivilegeQuery<VoipAudioSessionManager>(),
-                                             "sound_manager_call_session_create(1)"));
-  EXPECT_EQ(manager.GetCallSessionMode(), VOIP_AUDIO_SESSION_MODE_NONE);
-}
-
-TEST_F(NoCall, SessionLeftBehindByARefusalIsDestroyed) {
+  expectFailure(E_SYSTEM, Handle(E_SYSTEM, "system error", "null"), {kCreate});
   Simulated::SetCallSessionFault(Simulated::CallSessionFault::kSessionRemains);
-  Host::RecordCalls(true);
-  EXPECT_EQ(manager.EnterCallSession(), E_INVALID_OPERATION);
-  EXPECT_EQ(GetLastResult(), E_INVALID_OPERATION);
-  EXPECT_THAT(Host::TakeCalls(), ElementsAre(PrivilegeQuery<VoipAudioSessionManager>(),
-                                             "sound_manager_call_session_create(1)",
-                                             "sound_manager_call_session_destroy(1)"));
-  EXPECT_THAT(Simulated::GetCallSessionModes(), IsEmpty());
+  expectFailure(E_INVALID_OPERATION, Refused(E_INVALID_OPERATION, "create", code + "0xffffffda"),
+                {kCreate, kDestroy});
   Simulated::SetCallSessionFault(Simulated::CallSessionFault::kNone);
   EXPECT_EQ(manager.EnterCallSession(), E_SUCCESS);
 }
 
 class InCall : public NoCall {
  protected:
-  InCall() { EXPECT_EQ(manager.EnterCallSession(), E_SUCCESS); }
+  InCall() {
+    EXPECT_EQ(manager.EnterCallSession(), E_SUCCESS);
+    Forget();
+  }
 };
 
-TEST_F(InCall, CantBeEnteredAgainAndGoesOn) {
-  Host::RecordCalls(true);
+TEST_F(InCall, CantBeEnteredAgainAndGoesOnUntilItIsExited) {
   EXPECT_EQ(manager.EnterCallSession(), E_INVALID_OPERATION);
-  ExpectFailure(E_INVALID_OPERATION, kHandle + std::string("not null."));
-  ExpectNoPlatformCall();
+  ExpectLeftBehindGate(E_INVALID_OPERATION, {Handle(E_INVALID_OPERATION, "error", "not null")});
   EXPECT_EQ(manager.ExitCallSession(), E_SUCCESS);
+  EXPECT_THAT(Simulated::GetCallSessionModes(), IsEmpty());
   EXPECT_EQ(manager.EnterCallSession(), E_SUCCESS);
 }
 
-TEST_F(InCall, ModesReachThePlatformAndComeBack) {
+TEST_F(InCall, ModesReachThePlatformAndComeBackAndOthersAreRefusedHere) {
   const struct {
     int mode, platformMode, readBack;
   } rows[] = {{0, 0, 1}, {3, 2, 3}, {1, 0, 1}, {2, 1, 2}};
@@ -116,18 +94,12 @@ TEST_F(InCall, ModesReachThePlatformAndComeBack) {
     EXPECT_THAT(Simulated::GetCallSessionModes(), ElementsAre(row.platformMode));
     EXPECT_EQ(manager.GetCallSessionMode(), row.readBack);
   }
-  EXPECT_THAT(log.Take(), IsEmpty());
-}
-
-TEST_F(InCall, ModesOutsideTheEnumerationAreRefusedHere) {
-  EXPECT_EQ(manager.SetCallSessionMode(VOIP_AUDIO_SESSION_MODE_RINGTONE), E_SUCCESS);
+  Forget();
+  const std::string incorrect =
+      " [E_INVALID_ARG] Invalid argument is used. The mode is not correct : ";
   for (const int mode : {-1, 4, 5, INT_MAX, INT_MIN}) {
-    Host::RecordCalls(true);
     EXPECT_EQ(manager.SetCallSessionMode(Mode(mode)), E_INVALID_ARG);
-    ExpectFailure(E_INVALID_ARG,
-                  " [E_INVALID_ARG] Invalid argument is used. The mode is not correct : " +
-                      std::to_string(mode));
-    ExpectNoPlatformCall();
+    ExpectLeftBehindGate(E_INVALID_ARG, {Sys(E_INVALID_ARG, incorrect + std::to_string(mode))});
   }
   EXPECT_EQ(manager.GetCallSessionMode(), VOIP_AUDIO_SESSION_MODE_RINGTONE);
 }
@@ -136,22 +108,21 @@ TEST_F(InCall, DevicesRefusalChangesNothing) {
   EXPECT_EQ(manager.SetCallSessionMode(VOIP_AUDIO_SESSION_MODE_MEDIA), E_SUCCESS);
   for (const auto& [code, hex, r] : kPlatformFailures) {
     SCOPED_TRACE(code);
+    Forget();
     Host::FailCall("sound_manager_call_session_set_mode", code, 1);
     EXPECT_EQ(manager.SetCallSessionMode(VOIP_AUDIO_SESSION_MODE_VOICE), r);
-    ExpectFailure(r, Named(r, " Failed to perform sound_manager_call_session_set_mode operation."));
+    ExpectLeftBehindGate(r, {Refused(r, "set_mode", ".")},
+                         {"sound_manager_call_session_set_mode(1, 0)"});
     Host::FailCall("sound_manager_call_session_get_mode", code, 1);
     EXPECT_EQ(manager.GetCallSessionMode(), VOIP_AUDIO_SESSION_MODE_NONE);
-    ExpectFailure(r, Named(r,
-                           " Failed to perform sound_manager_call_session_get_mode operation "
-                           "with error code : " +
-                               std::string(hex)));
+    ExpectLeftBehindGate(r, {Refused(r, "get_mode", std::string(" with error code : ") + hex)},
+                         {"sound_manager_call_session_get_mode(1)"});
     Host::FailCall("sound_manager_call_session_destroy", code, 1);
     EXPECT_EQ(manager.ExitCallSession(), r);
-    ExpectFailure(r, Named(r, " Failed to perform sound_manager_call_session_destroy operation."));
+    ExpectLeftBehindGate(r, {Refused(r, "destroy", ".")}, {kDestroy});
     EXPECT_EQ(manager.GetCallSessionMode(), VOIP_AUDIO_SESSION_MODE_MEDIA);
   }
-  EXPECT_EQ(manager.ExitCallSession(), E_SUCCESS);
-  EXPECT_THAT(Simulated::GetCallSessionModes(), IsEmpty());
 }
 
 }  // namespace
+}  // namespace Zelkora::Media

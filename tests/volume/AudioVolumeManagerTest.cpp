@@ -1,25 +1,14 @@
-#include "support/LibraryTest.h"
 #include "support/Managers.h"
 
-#include <algorithm>
 #include <climits>
-#include <functional>
 
+namespace Zelkora::Media {
 namespace {
 
-using testing::Contains;
-using testing::ElementsAre;
-using testing::IsEmpty;
-using namespace Zelkora::Media;
-
-class VolumeLevels : public LibraryTest {
- protected:
-  AudioVolumeManager& manager = *AudioVolumeManager::GetInstance();
-};
+using VolumeLevels = ManagerTest<Volume>;
 
 TEST_F(VolumeLevels, EachCategoryHasALevelAndARangeOfItsOwnOnTheDevice) {
   for (const SoundCategory& category : kSoundCategories) {
-    SCOPED_TRACE(category.name);
     Simulated::SetMaxVolume(category.soundType, 20 + category.soundType);
     EXPECT_EQ(std::invoke(category.setLevel, manager, 10 + category.soundType), E_SUCCESS);
   }
@@ -38,35 +27,28 @@ TEST_F(VolumeLevels, EachCategoryHasALevelAndARangeOfItsOwnOnTheDevice) {
 TEST_F(VolumeLevels, LevelsOutOfRangeAreHandedToTheDeviceWhichJudgesThem) {
   for (const SoundCategory& category : kSoundCategories) {
     for (const int level : {-1, 16, INT_MAX, INT_MIN}) {
-      SCOPED_TRACE(std::string(category.name) + " " + std::to_string(level));
-      Host::RecordCalls(true);
+      SCOPED_TRACE(category.name + " " + std::to_string(level));
       EXPECT_EQ(std::invoke(category.setLevel, manager, level), E_INVALID_ARG);
-      EXPECT_THAT(Host::TakeCalls(),
-                  Contains("sound_manager_set_volume(" + std::to_string(category.soundType) + ", " +
-                           std::to_string(level) + ")"));
-      EXPECT_THAT(log.Take(), ElementsAre(SysNamed(E_INVALID_ARG,
-                                                   " sound_manager_set_volume failed with -22")));
+      ExpectLeftBehindGate(E_INVALID_ARG,
+                           {SysNamed(E_INVALID_ARG, " sound_manager_set_volume failed with -22")},
+                           {"sound_manager_set_volume(" + std::to_string(category.soundType) +
+                            ", " + std::to_string(level) + ")"});
     }
   }
 }
 
 TEST_F(VolumeLevels, DevicesRefusalIsConvertedAndLoggedWithItsCode) {
-  for (const auto& operation : Facts<AudioVolumeManager>::Operations()) {
+  for (const auto& operation : Facts<Volume>::Operations()) {
     const std::string function = operation.Function();
     if (function.rfind("_Event", 0) == 0) continue;  // the listeners' results aren't converted
-    for (const auto& failure : kPlatformFailures) {
-      SCOPED_TRACE(operation.name + " " + std::to_string(failure.code));
-      ClearLastResult();
-      Host::FailCall(function.c_str(), failure.code, 1);
-      Host::RecordCalls(true);
-      const std::int64_t expected =
-          operation.name == "GetMuteStatus" ? 0 : operation.Refused(failure.r);
-      EXPECT_EQ(operation.call(manager), expected);
-      EXPECT_EQ(GetLastResult(), failure.r);
-      EXPECT_THAT(Host::TakeCalls(),
-                  ElementsAre(PrivilegeQuery<AudioVolumeManager>(), operation.platformCall));
-      EXPECT_THAT(log.Take(), ElementsAre(SysNamed(failure.r, " " + function + " failed with " +
-                                                                  std::to_string(failure.code))));
+    for (const auto& [code, hex, r] : kPlatformFailures) {
+      SCOPED_TRACE(operation.name + " " + std::to_string(code));
+      Host::FailCall(function.c_str(), code, 1);
+      EXPECT_EQ(operation.call(manager),
+                operation.name == "GetMuteStatus" ? 0 : operation.Refused(r));
+      ExpectLeftBehindGate(r,
+                           {SysNamed(r, " " + function + " failed with " + std::to_string(code))},
+                           {operation.platformCall});
     }
   }
 }
@@ -77,25 +59,23 @@ TEST_F(VolumeLevels, RefusedRangeQueryStillGivesTheMinimumAndADeniedOneTouchesNo
     int min = 7, max = 8;
     Host::SetPrivilege("audiomanager.volume", E_PRIVILEGE_DENIED);
     EXPECT_EQ(std::invoke(category.getRange, manager, min, max), E_PRIVILEGE_DENIED);
-    EXPECT_EQ(min, 7);
-    EXPECT_EQ(max, 8);
+    EXPECT_EQ(std::pair(min, max), std::pair(7, 8));
     Host::ResetCapabilities();
     Host::FailCall("sound_manager_get_max_volume", -22, 1);
     EXPECT_EQ(std::invoke(category.getRange, manager, min, max), E_INVALID_ARG);
-    EXPECT_EQ(min, 0);
-    EXPECT_EQ(max, 8);
+    EXPECT_EQ(std::pair(min, max), std::pair(0, 8));
   }
 }
 
 TEST_F(VolumeLevels, MutingIsTheDevicesStateAndLeavesTheLevels) {
   EXPECT_EQ(manager.GetMuteStatus(), AUDIO_MUTE_STATUS_UNMUTED);
-  Host::RecordCalls(true);
-  EXPECT_EQ(manager.MuteAll(), E_SUCCESS);
-  EXPECT_EQ(manager.MuteAll(), E_SUCCESS);
-  const auto calls = Host::TakeCalls();
-  EXPECT_EQ(std::count(calls.begin(), calls.end(), "sound_manager_set_muteall(true)"), 2);
-  EXPECT_EQ(manager.GetMuteStatus(), AUDIO_MUTE_STATUS_MUTED);
-  EXPECT_EQ(manager.GetCurrentMediaVolumeLevel(), 7);
+  for (int i = 0; i < 2; ++i) {
+    Forget();
+    EXPECT_EQ(manager.MuteAll(), E_SUCCESS);
+    ExpectLeftBehindGate(kUntouched, {}, {"sound_manager_set_muteall(true)"});
+    EXPECT_EQ(manager.GetMuteStatus(), AUDIO_MUTE_STATUS_MUTED);
+    EXPECT_EQ(manager.GetCurrentMediaVolumeLevel(), 7);
+  }
   EXPECT_EQ(manager.UnmuteAll(), E_SUCCESS);
   EXPECT_EQ(manager.GetMuteStatus(), AUDIO_MUTE_STATUS_UNMUTED);
   Simulated::ReportMuteAll(true);
@@ -103,3 +83,4 @@ TEST_F(VolumeLevels, MutingIsTheDevicesStateAndLeavesTheLevels) {
 }
 
 }  // namespace
+}  // namespace Zelkora::Media

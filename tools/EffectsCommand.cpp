@@ -1,0 +1,217 @@
+#include "Commands.h"
+#include "Failure.h"
+#include "FrequencyResponse.h"
+#include "Output.h"
+#include "OutputFile.h"
+#include "ResponsePlot.h"
+#include "Sound.h"
+#include "StopSignal.h"
+#include "TemporaryFolder.h"
+
+#include <fmt/format.h>
+
+#include <charconv>
+#include <filesystem>
+#include <memory>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace CommandLine {
+namespace {
+
+using Zelkora::Media::AudioEffector;
+
+constexpr std::size_t kLineLength = 80;  // of the list of presets, in characters
+
+// While playing, in milliseconds.
+constexpr int kLookEvery = 100;
+constexpr int kLongestStandstill = 3000;
+
+struct Options {
+  std::string file;  // "" for none
+  std::vector<std::string> levels;
+  std::vector<std::string> presets;
+  std::vector<Sound::Change> changes;  // of both and of the resets, in the order given
+  bool play = false;
+  std::string rendering;  // "" for none
+  std::string plot;       // "" for none
+};
+
+struct EffectLevel {
+  Sound::Effect effect;
+  int level;
+};
+
+/// \return the effect and the level in "bass=6", if that's what it is.
+std::optional<EffectLevel> ToEffectLevel(const std::string& text) {
+  const std::size_t equals = std::min(text.find('='), text.size());
+  const auto* row = Find(kEffects, text.substr(0, equals));
+  EffectLevel result{};
+  const char* end = text.data() + text.size();
+  const auto [rest, error] =
+      std::from_chars(std::min(text.data() + equals + 1, end), end, result.level);
+  if (row == nullptr || rest != end || error != std::errc()) return std::nullopt;
+  result.effect = row->value;
+  return result;
+}
+
+std::string CheckEffectLevel(const std::string& text) {
+  if (ToEffectLevel(text)) return "";
+  return fmt::format("'{}' is not like bass=6; the effects are: {}", text, NamesIn(kEffects));
+}
+
+Sound::Change ChangeOfLevel(const std::string& text) {
+  const EffectLevel wanted = *ToEffectLevel(text);
+  return {fmt::format("{} {}", NameOf(kEffects, wanted.effect), wanted.level),
+          [wanted](AudioEffector& effector) {
+            return effector.SetEffectLevel(wanted.effect, wanted.level);
+          }};
+}
+
+Sound::Change ChangeOfPreset(const std::string& name) {
+  return {fmt::format("preset {}", name), [preset = Find(kPresets, name)->value](
+                                              AudioEffector& effector) {
+            return effector.SetEffectPreset(preset);
+          }};
+}
+
+Sound::Change ResetOfAll() {
+  return {"all to default", [](AudioEffector& effector) { return effector.ResetAllToDefault(); }};
+}
+
+std::string Describe(const std::vector<Sound::Change>& changes) {
+  std::string text;
+  for (const Sound::Change& change : changes) text += (text.empty() ? "" : ", ") + change.text;
+  return text.empty() ? "neutral" : text;
+}
+
+void PrintEffects(const Sound& sound) {
+  Print("effect        level  lowest  highest\n");
+  for (Sound::Effect effect : sound.Effects()) {
+    const Sound::Level level = sound.LevelOf(effect);
+    Print(fmt::format("{:<12}  {:>5}  {:>6}  {:>7}\n", NameOf(kEffects, effect), level.now,
+                      level.min, level.max));
+  }
+}
+
+void PrintPresets(const Sound& sound) {
+  std::string line = "presets:";
+  for (Sound::Preset preset : sound.Presets()) {
+    const std::string name = NameOf(kPresets, preset);
+    if (line.size() + 1 + name.size() > kLineLength) {
+      Print(line + "\n");
+      line = "        ";
+    }
+    line += " " + name;
+  }
+  Print(line + "\n");
+}
+
+/// Plays to the end, or as long as the position changes.
+void Play(Sound& sound) {
+  StopSignal stop;
+  sound.Play();
+  long before = -1;
+  for (int still = 0; still < kLongestStandstill; still += kLookEvery) {
+    if (stop.Wait(kLookEvery)) return sound.Pause();
+    const long position = sound.Position();
+    if (position >= sound.Duration()) return;
+    if (position != before) still = 0;
+    before = position;
+  }
+  PrintError(fmt::format("note: the player stands still at {} ms", before));
+}
+
+void Render(const Sound& sound, const Options& options) {
+  OutputFile::Try(options.rendering);  // before the work, which may take long
+  std::error_code ignored;
+  if (std::filesystem::equivalent(options.file, options.rendering, ignored)) {
+    throw Failure(fmt::format("{} is the file to read", options.rendering));
+  }
+  sound.Render(options.rendering);
+  Print(fmt::format("{}: {}\n", options.rendering, Describe(options.changes)));
+}
+
+/// Measures what the changes do to noise, on players of its own.
+FrequencyResponse Measure(const std::vector<Sound::Change>& changes) {
+  const TemporaryFolder folder;
+  const std::string noise = folder.PathOf("noise.wav");
+  const std::string neutral = folder.PathOf("neutral.wav");
+  const std::string changed = folder.PathOf("changed.wav");
+  WriteNoise(noise);
+  Sound sound;
+  sound.Open(noise);
+  sound.Render(neutral);
+  sound.Apply(changes);
+  sound.Render(changed);
+  return CompareRecordings(neutral, changed);
+}
+
+void DrawPlot(const Options& options) {
+  OutputFile::Try(options.plot);  // before the work, which may take long
+  WriteResponsePlot(options.plot, Measure(options.changes), Describe(options.changes));
+  Print(fmt::format("{}: {}\n", options.plot, Describe(options.changes)));
+}
+
+int ShowOrChangeEffects(const Options& options) {
+  Sound sound;
+  if (!options.file.empty()) sound.Open(options.file);
+  sound.Apply(options.changes);
+  PrintEffects(sound);
+  PrintPresets(sound);
+  if (!options.rendering.empty()) Render(sound, options);
+  if (!options.plot.empty()) DrawPlot(options);
+  if (options.play) Play(sound);
+  return 0;
+}
+
+/// The changes in the order in which the user gave them.
+std::vector<Sound::Change> ChangesIn(const CLI::App& command, const Options& options) {
+  std::vector<Sound::Change> changes;
+  auto level = options.levels.begin();
+  auto preset = options.presets.begin();
+  for (const CLI::Option* option : command.parse_order()) {
+    if (option->check_name("--set")) changes.push_back(ChangeOfLevel(*level++));
+    if (option->check_name("--preset")) changes.push_back(ChangeOfPreset(*preset++));
+    if (option->check_name("--reset")) changes.push_back(ResetOfAll());
+  }
+  return changes;
+}
+
+void AddOptions(CLI::App* command, Options& options) {
+  auto* file = command->add_option("FILE", options.file, "A file with sound")->type_name("");
+  command->add_option("--set", options.levels, "Set an effect: " + NamesIn(kEffects))
+      ->check(CheckEffectLevel)
+      ->allow_extra_args(false)
+      ->type_name("EFFECT=LEVEL");
+  command->add_option("--preset", options.presets, "Select a preset: " + NamesIn(kPresets))
+      ->check(OneOf(kPresets, "preset"))
+      ->allow_extra_args(false)
+      ->type_name("PRESET");
+  command->add_flag("--reset", "Put everything back to its default");
+  command->add_flag("--play", options.play, "Play the file to its end or to Ctrl-C")->needs(file);
+  command->add_option("--render", options.rendering, "Write what is heard, a WAV file")
+      ->needs(file)
+      ->type_name("FILE");
+  command->add_option("--plot", options.plot,
+                      "Measure the frequency response and draw it, as SVG or PNG by the ending")
+      ->type_name("FILE");
+}
+
+}  // namespace
+
+void AddEffectsCommand(CLI::App& program, Command& chosen) {
+  auto options = std::make_shared<Options>();
+  auto* command = program.add_subcommand("effects", "Show or change the sound of a player");
+  AddOptions(command, *options);
+  command->footer(
+      "Changes are made in the order given.\n"
+      "Example: zelkora effects song.ogg --preset rock --set bass=6 --play");
+  command->callback([options, command, &chosen] {
+    options->changes = ChangesIn(*command, *options);
+    chosen = [options] { return ShowOrChangeEffects(*options); };
+  });
+}
+
+}  // namespace CommandLine

@@ -37,6 +37,7 @@ class CommandLine : public testing::Test {
 
   CommandLine() {
     setenv("LSAN_OPTIONS", "print_suppressions=0:suppressions=" LEAKS_OF_OTHERS, 0);
+    setenv("ASAN_OPTIONS", "fast_unwind_on_malloc=0", 0);  // those libraries have no frame pointers
     std::string pattern = fs::temp_directory_path() / "zelkora-XXXXXX";
     base_ = mkdtemp(pattern.data());
     fs::create_directory(folder_ = base_ / "folder");
@@ -70,6 +71,10 @@ class CommandLine : public testing::Test {
 class WrongUsage : public CommandLine {};
 class Seek : public CommandLine {};
 class Filmstrip : public CommandLine {};
+class Managers : public CommandLine {};
+class StopSignal : public CommandLine {};
+class Shell : public CommandLine {};
+class Effects : public CommandLine {};
 class Devices : public CommandLine {};
 class DeviceScript : public CommandLine {};
 
@@ -94,6 +99,11 @@ TEST_F(WrongUsage, IsExplainedOnStandardErrorAndExitsWith2) {
                                         {"seek a.mp4 1:30", "'1:30'"},
                                         {"filmstrip a.mp4 -n 0", "1 to 500"},
                                         {"filmstrip a.mp4 -n 501", "1 to 500"},
+                                        {"volume medi", "system, notification"},
+                                        {"volume media x", "LEVEL"},
+                                        {"call --mode voice media", "--for"},
+                                        {"effects --set bass", "like bass=6"},
+                                        {"effects --render a.wav", "FILE"},
                                         {"--device nix devices", "simulated"}}) {
     SCOPED_TRACE(options);
     const Outcome outcome = Run(PROGRAM " " + std::string(options));
@@ -183,6 +193,119 @@ TEST_F(Filmstrip, ThatCannotBeWrittenLeavesNothing) {
       Run("(ulimit -f 0; trap '' XFSZ; " + kSimulated + "filmstrip a.mp4 2>&1) | cat");
   EXPECT_EQ(limited.output, "zelkora: cannot write strip.png: File too large\n");
   EXPECT_TRUE(fs::is_empty(folder_));
+}
+
+TEST_F(Managers, AreShownAndSet) {
+  for (const auto& [command, output] :
+       {std::pair{"volume media", "media             7       15  #########...........\n"},
+        {"volume media 15", ""},
+        {"mute", "off\n"},
+        {"mute on", ""},
+        {"session", "media\n"},
+        {"session alarm", ""},
+        {"call --for 0", "in a call, mode voice\ncall ended\n"},
+        {"call --for 0 --mode ringtone media",
+         "in a call, mode ringtone\nin a call, mode media\ncall ended\n"}}) {
+    SCOPED_TRACE(command);
+    const Outcome outcome = Run(kSimulated + command);
+    EXPECT_EQ(outcome.output, output);
+    EXPECT_THAT(outcome.errors, IsEmpty());
+    EXPECT_EQ(outcome.code, 0);
+  }
+}
+
+TEST_F(Managers, RefusalIsExplainedAndExitsWith1) {
+  const Outcome outcome = Run(kSimulated + "volume media 16");
+  EXPECT_EQ(outcome.errors,
+            "zelkora: cannot set the media volume to 16: an argument is rejected (E_INVALID_ARG)\n");
+  EXPECT_EQ(outcome.code, 1);
+}
+
+TEST_F(StopSignal, EndsAMonitorWithSuccess) {
+  for (const std::string signal : {"INT", "TERM", "HUP"}) {
+    SCOPED_TRACE(signal);
+    const Outcome outcome = Run("rm -f pipe; mkfifo pipe; " + kSimulated +
+                                "monitor --session alarm 2>pipe & read line <pipe; kill -" +
+                                signal + " $!; wait $!");
+    EXPECT_THAT(outcome.output, IsEmpty());
+    EXPECT_EQ(outcome.code, 0);
+  }
+}
+
+TEST_F(StopSignal, ClosesACall) {
+  const Outcome outcome = Run("mkfifo pipe; " + kSimulated +
+                              "call >pipe & exec 3<pipe; read line <&3; kill -INT $!; cat <&3;"
+                              " wait $!");
+  EXPECT_EQ(outcome.output, "call ended\n");
+  EXPECT_EQ(outcome.code, 0);
+}
+
+TEST_F(Shell, PlaysEachScenarioAsExpected) {
+  int count = 0;
+  for (fs::path file : fs::directory_iterator(SCENARIOS)) {
+    if (file.extension() != ".txt") continue;
+    SCOPED_TRACE(file);
+    ++count;
+    const Outcome outcome = Run(kSimulated + "shell " + file.string() + " 2>&1");
+    EXPECT_EQ(outcome.output, Read(file.replace_extension(".expected")));
+    EXPECT_EQ(outcome.code, 0);
+  }
+  EXPECT_GE(count, 3);
+}
+
+TEST_F(Shell, EndsAtALineThatIsNotUnderstood) {
+  const Outcome outcome = Run("printf '# words\\nfrob\\nmute' | " + kSimulated + "shell");
+  EXPECT_EQ(outcome.output, "# words\n> frob\n");
+  EXPECT_THAT(outcome.errors, StartsWith("zelkora: standard input:2: "));
+  EXPECT_EQ(outcome.code, 2);
+}
+
+TEST_F(Shell, InATerminalPromptsAndGoesOnAfterAMistake) {
+  const Outcome outcome =
+      Run("printf 'frob\\nsession alarm\\nsession\\nexit\\n' | script -qec '" + kSimulated +
+          "shell' /dev/null");
+  EXPECT_THAT(outcome.output, HasSubstr("zelkora> "));
+  EXPECT_THAT(outcome.output, HasSubstr("not expected: frob"));
+  EXPECT_THAT(outcome.output, HasSubstr("\nalarm\r\n"));
+  EXPECT_EQ(outcome.code, 0);
+}
+
+TEST_F(Effects, AreChangedInTheOrderGiven) {
+  for (const auto& [options, bass, treble] :
+       {std::tuple{"", "bass              0", "treble            0"},
+        {"--set bass=6 --preset rock --set treble=-12", "bass              6",
+         "treble          -12"},
+        {"--set bass=6 --reset --set treble=3", "bass              0", "treble            3"},
+        {"--set bass=6 --set bass=-1 a.ogg", "bass             -1", "treble            0"}}) {
+    SCOPED_TRACE(options);
+    const Outcome outcome = Run(kSimulated + "effects " + options);
+    EXPECT_THAT(outcome.output, testing::AllOf(HasSubstr(bass), HasSubstr(treble)));
+    EXPECT_EQ(outcome.code, 0);
+  }
+}
+
+TEST_F(Effects, OutsideTheirRangeAreRefused) {
+  const Outcome outcome = Run(kSimulated + "effects --set bass=13");
+  EXPECT_THAT(outcome.errors, StartsWith("zelkora: cannot set bass 13: level 13 is outside"));
+  EXPECT_EQ(outcome.code, 1);
+}
+
+#ifdef WITH_DESKTOP
+TEST_F(Effects, ArePlotted) {
+  const Outcome outcome = Run(PROGRAM " effects --set bass=6 --plot a.png &&" PROGRAM
+                                      " effects --preset rock --plot b.svg");
+  EXPECT_EQ(outcome.code, 0) << outcome.errors;
+  EXPECT_EQ(PictureSize(Read(folder_ / "a.png")), std::pair(900u, 480u));
+  EXPECT_THAT(Read(folder_ / "b.svg"), HasSubstr("</svg>"));
+}
+#endif
+
+TEST_F(Effects, ThatCannotBeHeardLeaveNoFile) {
+  for (const std::string options : {"a.ogg --render b.wav", "--plot b.svg"}) {
+    SCOPED_TRACE(options);
+    EXPECT_EQ(Run(kSimulated + "effects " + options).code, 1);
+    EXPECT_TRUE(fs::is_empty(folder_));
+  }
 }
 
 TEST_F(Devices, MarksTheOneInUse) {

@@ -92,9 +92,9 @@ int ShowOrSetMode(const std::string& wanted) {
 void AddCallCommand(CLI::App& program, Command& chosen) {
   auto options = std::make_shared<Options>();
   auto* command = program.add_subcommand("call", "Hold a call session until Ctrl-C");
-  auto* modes = command->add_option("--mode", options->modes,
-                                    fmt::format("Mode or modes, one after the other: {}",
-                                                NamesIn(kCallModes)));
+  auto* modes = command->add_option(
+      "--mode", options->modes,
+      fmt::format("Mode or modes, one after the other: {}", NamesIn(kCallModes)));
   modes->check(OneOf(kCallModes, "mode"))->type_name("MODE");
   command->add_option("--for", options->seconds, "End each mode after so many seconds")
       ->check(CLI::Range(0.0, kLongest).description(""))

@@ -10,6 +10,7 @@
 
 #include <fmt/format.h>
 
+#include <algorithm>
 #include <charconv>
 #include <filesystem>
 #include <memory>
@@ -47,13 +48,13 @@ struct EffectLevel {
 std::optional<EffectLevel> ToEffectLevel(const std::string& text) {
   const std::size_t equals = std::min(text.find('='), text.size());
   const auto* row = Find(kEffects, text.substr(0, equals));
-  EffectLevel result{};
+  EffectLevel wanted{};
   const char* end = text.data() + text.size();
   const auto [rest, error] =
-      std::from_chars(std::min(text.data() + equals + 1, end), end, result.level);
+      std::from_chars(std::min(text.data() + equals + 1, end), end, wanted.level);
   if (row == nullptr || rest != end || error != std::errc()) return std::nullopt;
-  result.effect = row->value;
-  return result;
+  wanted.effect = row->value;
+  return wanted;
 }
 
 std::string CheckEffectLevel(const std::string& text) {
@@ -70,8 +71,8 @@ Sound::Change ChangeOfLevel(const std::string& text) {
 }
 
 Sound::Change ChangeOfPreset(const std::string& name) {
-  return {fmt::format("preset {}", name), [preset = Find(kPresets, name)->value](
-                                              AudioEffector& effector) {
+  return {fmt::format("preset {}", name),
+          [preset = Find(kPresets, name)->value](AudioEffector& effector) {
             return effector.SetEffectPreset(preset);
           }};
 }
@@ -194,8 +195,9 @@ void AddOptions(CLI::App* command, Options& options) {
   command->add_option("--render", options.rendering, "Write what is heard, a WAV file")
       ->needs(file)
       ->type_name("FILE");
-  command->add_option("--plot", options.plot,
-                      "Measure the frequency response and draw it, as SVG or PNG by the ending")
+  command
+      ->add_option("--plot", options.plot,
+                   "Measure the frequency response and draw it, as SVG or PNG by the ending")
       ->type_name("FILE");
 }
 

@@ -33,8 +33,8 @@ class Lines {
   std::vector<std::string> lines_;
 };
 
-/// Hears of volumes, of muting and of interruptions for as long as it exists, and puts each event in
-/// the words that also the commands have: "volume media 9", "mute on", "interruption started".
+/// Hears of volumes, of muting and of interruptions for as long as it exists, and puts each event
+/// in the words that also the commands have: "volume media 9", "mute on", "interruption started".
 class Events : public Zelkora::Media::IAudioVolumeEventListener,
                public Zelkora::Media::IAudioSessionEventListener {
  public:
@@ -64,7 +64,7 @@ class Events : public Zelkora::Media::IAudioVolumeEventListener,
 
   Lines& lines_;
   const std::string mark_;
-  Zelkora::Media::AudioVolumeManager* volumes_ = nullptr;    // null while this doesn't listen to it
+  Zelkora::Media::AudioVolumeManager* volumes_ = nullptr;   // null while this doesn't listen to it
   Zelkora::Media::AudioSessionManager* session_ = nullptr;  // likewise
 };
 

@@ -10,12 +10,13 @@
 #include <cmath>
 #include <memory>
 #include <random>
+#include <type_traits>
 
 namespace CommandLine {
 namespace {
 
-constexpr int kRate = 48000;    // of the noise, in samples a second
-constexpr int kSeconds = 20;    // of the noise
+constexpr int kRate = 48000;  // of the noise, in samples a second
+constexpr int kSeconds = 20;  // of the noise
 constexpr int kChannels = 2;
 constexpr double kLevel = 0.05;  // root mean square of the noise: -26 dB below full scale
 
@@ -116,7 +117,7 @@ void WriteNoise(const std::string& path) {
   info.channels = kChannels;
   info.format = SF_FORMAT_WAV | SF_FORMAT_PCM_16;
   const SoundFile file = OpenSound(path, SFM_WRITE, info);
-  std::mt19937 generator;  // NOLINT: its own constant seed is wanted
+  std::mt19937 generator;  // seeded always the same
   std::normal_distribution<double> distribution(0, kLevel);
   std::vector<double> frames(kRate * kSeconds * kChannels);
   for (double& sample : frames) sample = distribution(generator);

@@ -18,7 +18,8 @@ using FrequencyResponse = std::vector<ResponsePoint>;
 /// to be amplified without being limited. Throws a `Failure` when it can't be written.
 void WriteNoise(const std::string& file);
 
-/// Compares two recordings of that noise. Throws a `Failure` when one can't be read or is too short.
+/// Compares two recordings of that noise. Throws a `Failure` when one can't be read or is too
+/// short.
 FrequencyResponse CompareRecordings(const std::string& neutral, const std::string& changed);
 
 }  // namespace CommandLine

@@ -2,6 +2,8 @@
 
 #include "Failure.h"
 
+#include <fmt/format.h>
+
 namespace CommandLine {
 namespace {
 

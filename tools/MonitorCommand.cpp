@@ -8,6 +8,7 @@
 #include <poll.h>
 #include <unistd.h>
 
+#include <iterator>
 #include <memory>
 #include <string>
 
@@ -15,8 +16,8 @@ namespace CommandLine {
 namespace {
 
 struct Options {
-  std::string mode;     // "" to leave the session as it is
-  long count = 0;  // of events to end after; 0 for no end
+  std::string mode;  // "" to leave the session as it is
+  long count = 0;    // of events to end after; 0 for no end
 };
 
 /// Waits for lines. \return false when it is time to end: a signal came, or nobody reads any more
@@ -24,7 +25,8 @@ bool WaitForLines(const Lines& lines, const StopSignal& stop) {
   pollfd ready[] = {{lines.Descriptor(), POLLIN, 0},
                     {stop.Descriptor(), POLLIN, 0},
                     {STDOUT_FILENO, 0, 0}};  // tells an error when the reader of a pipe is gone
-  while (poll(ready, std::size(ready), -1) < 0) {}
+  while (poll(ready, std::size(ready), -1) < 0) {
+  }
   if ((ready[2].revents & POLLERR) != 0) throw OutputIsClosed();
   return ready[1].revents == 0;
 }
@@ -41,6 +43,7 @@ long PrintLines(Lines& lines, long most) {
 }
 
 int Monitor(const Options& options) {
+  RequireOutput();
   StopSignal stop;
   Lines lines;
   Events events(lines);
@@ -62,8 +65,9 @@ void AddMonitorCommand(CLI::App& program, Command& chosen) {
   command->add_option("--count", options->count, "End after so many events")
       ->check(CLI::PositiveNumber.description(""))
       ->type_name("N");
-  command->add_option("--session", options->mode,
-                      "Set the session's mode before: " + NamesIn(kSessionModes))
+  command
+      ->add_option("--session", options->mode,
+                   "Set the session's mode before: " + NamesIn(kSessionModes))
       ->check(OneOf(kSessionModes, "mode"))
       ->type_name("MODE");
   command->footer("Ends with success on Ctrl-C.");

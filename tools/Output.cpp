@@ -18,6 +18,10 @@ void Print(std::string_view text) {
   FailWithSystemError("write to standard output", errno);
 }
 
+void RequireOutput() {
+  if ((fcntl(STDOUT_FILENO, F_GETFL) & O_ACCMODE) == O_RDONLY) throw OutputIsClosed();
+}
+
 void ReserveStandardStreams() {
   for (int stream = STDIN_FILENO; stream <= STDERR_FILENO; ++stream) {
     if (fcntl(stream, F_GETFD) >= 0) continue;

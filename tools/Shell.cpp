@@ -8,8 +8,10 @@
 
 #include <Host/Calls.h>
 #include <Host/Capabilities.h>
+#include <fmt/format.h>
 #include <poll.h>
 
+#include <iterator>
 #include <memory>
 #include <sstream>
 #include <utility>
@@ -19,8 +21,6 @@ namespace {
 
 constexpr int kFailed = 1;
 constexpr int kWrongUsage = 2;
-
-
 
 bool IsBlank(char character) { return character == ' ' || character == '\t' || character == '\r'; }
 
@@ -37,7 +37,8 @@ std::string Format(const Host::LogRecord& record) {
   std::string line = record.level == Host::LogLevel::kInfo ? "-" : "!";
   if (record.module != 0) line += fmt::format(" module {}", record.module);
   if (record.tag[0] != '\0') line += fmt::format(" tag {}", record.tag);
-  if (record.hasResult && record.message[0] != '[') line += " " + std::string(GetErrorMessage(record.code));
+  if (record.hasResult && record.message[0] != '[')
+    line += " " + std::string(GetErrorMessage(record.code));
   return line + ": " + record.message;
 }
 
@@ -135,7 +136,6 @@ void Shell::RunCommand(const std::string& text) {
 }
 
 void Shell::AddCommands(CLI::App& app, Command& chosen) {
-  app.set_help_flag();
   app.get_formatter()->label("SUBCOMMAND", "COMMAND");
   app.require_subcommand(0, 1);
   AddVolumeCommand(app, chosen);

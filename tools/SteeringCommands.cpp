@@ -96,8 +96,7 @@ int ReportMute(const Words& words) {
 int SetFeature(const Words& words) {
   const auto* named = Find(kFeatureAnswers, words.value);
   const result answer = named != nullptr ? named->value : Find(kResults, words.value)->value;
-  RequireKnown(Host::SetFeature(words.subject, answer), "feature", words.subject,
-               Host::kFeatures);
+  RequireKnown(Host::SetFeature(words.subject, answer), "feature", words.subject, Host::kFeatures);
   return 0;
 }
 
@@ -157,9 +156,8 @@ void AddFailCommand(CLI::App& shell, Command& chosen) {
   auto words = std::make_shared<Words>();
   auto* fail = Add(shell, "fail", "Make a platform function fail; without words, end all failures",
                    FailCall, words, chosen);
-  auto* function =
-      fail->add_option("FUNCTION", words->subject, "Such as sound_manager_set_volume")
-          ->type_name("");
+  auto* function = fail->add_option("FUNCTION", words->subject, "Such as sound_manager_set_volume")
+                       ->type_name("");
   auto* code = fail->add_option("CODE", words->value, "What it returns: a number or a result")
                    ->check(CheckCode)
                    ->type_name("");
@@ -186,8 +184,8 @@ void AddSteeringCommands(CLI::App& shell, Command& chosen) {
       ->required()
       ->type_name("");
   AddReportCommand(shell, chosen);
-  auto* feature = Add(shell, "feature", "Say whether the device offers a feature", SetFeature,
-                      words, chosen);
+  auto* feature =
+      Add(shell, "feature", "Say whether the device offers a feature", SetFeature, words, chosen);
   AddWord(feature, "NAME", words->subject, "The feature");
   AddWord(feature, "ANSWER", words->value, NamesIn(kFeatureAnswers) + ", or a result's name")
       ->check(CheckFeatureAnswer);

@@ -20,6 +20,8 @@ StopSignal::StopSignal() {
 }
 
 StopSignal::~StopSignal() {
+  while (Take() != 0) {
+  }  // answered by now; else they would end the program here
   close(descriptor_);
   pthread_sigmask(SIG_SETMASK, &before_, nullptr);
 }

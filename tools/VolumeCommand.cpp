@@ -41,8 +41,8 @@ std::string Bar(const Volume& volume) {
   return std::string(std::size_t(within), '#') + std::string(std::size_t(kBarWidth - within), '.');
 }
 
-/// Prints one row after the other, so that the table stays whole. The first failure is told at the end:
-/// as a rule the others have the same reason.
+/// Prints one row after the other, so that the table stays whole. The first failure is told at the
+/// end: as a rule the others have the same reason.
 class Table {
  public:
   void AddHeading() { Print("category      level  highest\n"); }

@@ -1,5 +1,5 @@
-// A music player's skeleton: keeps the volume that its user chose, pauses on an interruption, resumes
-// afterwards only if it was playing, and plays on without what it isn't permitted to do.
+// A music player's skeleton: keeps the volume that its user chose, pauses on an interruption,
+// resumes afterwards only if it was playing, and plays on without what it isn't permitted to do.
 //
 //     music-player FILE        reads "play", "pause" and "quit" from standard input
 

@@ -216,17 +216,18 @@ TEST_F(Managers, AreShownAndSet) {
 
 TEST_F(Managers, RefusalIsExplainedAndExitsWith1) {
   const Outcome outcome = Run(kSimulated + "volume media 16");
-  EXPECT_EQ(outcome.errors,
-            "zelkora: cannot set the media volume to 16: an argument is rejected (E_INVALID_ARG)\n");
+  EXPECT_EQ(
+      outcome.errors,
+      "zelkora: cannot set the media volume to 16: an argument is rejected (E_INVALID_ARG)\n");
   EXPECT_EQ(outcome.code, 1);
 }
 
 TEST_F(StopSignal, EndsAMonitorWithSuccess) {
   for (const std::string signal : {"INT", "TERM", "HUP"}) {
     SCOPED_TRACE(signal);
-    const Outcome outcome = Run("rm -f pipe; mkfifo pipe; " + kSimulated +
-                                "monitor --session alarm 2>pipe & read line <pipe; kill -" +
-                                signal + " $!; wait $!");
+    const Outcome outcome =
+        Run("rm -f pipe; mkfifo pipe; " + kSimulated +
+            "monitor --session alarm 2>pipe & read line <pipe; kill -" + signal + " $!; wait $!");
     EXPECT_THAT(outcome.output, IsEmpty());
     EXPECT_EQ(outcome.code, 0);
   }
@@ -261,9 +262,8 @@ TEST_F(Shell, EndsAtALineThatIsNotUnderstood) {
 }
 
 TEST_F(Shell, InATerminalPromptsAndGoesOnAfterAMistake) {
-  const Outcome outcome =
-      Run("printf 'frob\\nsession alarm\\nsession\\nexit\\n' | script -qec '" + kSimulated +
-          "shell' /dev/null");
+  const Outcome outcome = Run("printf 'frob\\nsession alarm\\nsession\\nexit\\n' | script -qec '" +
+                              kSimulated + "shell' /dev/null");
   EXPECT_THAT(outcome.output, HasSubstr("zelkora> "));
   EXPECT_THAT(outcome.output, HasSubstr("not expected: frob"));
   EXPECT_THAT(outcome.output, HasSubstr("\nalarm\r\n"));

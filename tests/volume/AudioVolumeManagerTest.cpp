@@ -1,3 +1,4 @@
+#include "support/Allocations.h"
 #include "support/Managers.h"
 
 #include <climits>
@@ -80,6 +81,18 @@ TEST_F(VolumeLevels, MutingIsTheDevicesStateAndLeavesTheLevels) {
   EXPECT_EQ(manager.GetMuteStatus(), AUDIO_MUTE_STATUS_UNMUTED);
   Simulated::ReportMuteAll(true);
   EXPECT_EQ(manager.GetMuteStatus(), AUDIO_MUTE_STATUS_MUTED);
+}
+
+TEST_F(VolumeLevels, GuardedOperationsAllocateNothing) {
+  Host::RecordCalls(false);
+  int min = 0, max = 0;
+  const std::size_t before = CountAllocations();
+  EXPECT_EQ(manager.SetMediaVolumeLevel(7), E_SUCCESS);
+  EXPECT_EQ(manager.GetCurrentMediaVolumeLevel(), 7);
+  EXPECT_EQ(manager.GetMediaVolumeRange(min, max), E_SUCCESS);
+  EXPECT_EQ(manager.UnmuteAll(), E_SUCCESS);
+  EXPECT_EQ(manager.GetMuteStatus(), AUDIO_MUTE_STATUS_UNMUTED);
+  EXPECT_EQ(CountAllocations(), before);
 }
 
 }  // namespace

@@ -38,6 +38,7 @@ class CommandLine : public testing::Test {
   CommandLine() {
     setenv("LSAN_OPTIONS", "print_suppressions=0:suppressions=" LEAKS_OF_OTHERS, 0);
     setenv("ASAN_OPTIONS", "fast_unwind_on_malloc=0", 0);  // those libraries have no frame pointers
+    setenv("TSAN_OPTIONS", "ignore_noninstrumented_modules=1:suppressions=" RACES_OF_OTHERS, 0);
     std::string pattern = fs::temp_directory_path() / "zelkora-XXXXXX";
     base_ = mkdtemp(pattern.data());
     fs::create_directory(folder_ = base_ / "folder");

@@ -3,7 +3,7 @@ set(CMAKE_SYSTEM_PROCESSOR armv7l)
 set(CMAKE_C_COMPILER arm-linux-gnueabihf-gcc)
 set(CMAKE_CXX_COMPILER arm-linux-gnueabihf-g++)
 
-set(flags "-march=armv7-a -mfpu=vfpv3-d16 -mfloat-abi=hard -mthumb")
+set(flags "-march=armv7-a -mfpu=vfpv3-d16 -mfloat-abi=hard -mthumb -Wno-psabi")
 set(CMAKE_C_FLAGS_INIT "${flags}")
 set(CMAKE_CXX_FLAGS_INIT "${flags}")
 

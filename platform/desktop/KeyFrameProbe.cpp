@@ -5,11 +5,13 @@
 namespace Desktop {
 namespace {
 
+/// Motion JPEG is decoded by what GStreamer counts among the decoders of images.
 bool IsVideoDecoder(GstElement* element) {
   GstElementFactory* factory = gst_element_get_factory(element);
-  return factory != nullptr &&
-         gst_element_factory_list_is_type(
-             factory, GST_ELEMENT_FACTORY_TYPE_DECODER | GST_ELEMENT_FACTORY_TYPE_MEDIA_VIDEO);
+  constexpr GstElementFactoryListType kWhat = GST_ELEMENT_FACTORY_TYPE_DECODER |
+                                              GST_ELEMENT_FACTORY_TYPE_MEDIA_VIDEO |
+                                              GST_ELEMENT_FACTORY_TYPE_MEDIA_IMAGE;
+  return factory != nullptr && gst_element_factory_list_is_type(factory, kWhat);
 }
 
 }  // namespace

@@ -175,7 +175,11 @@ int Playback::Land(long position, bool exact) {
   landed_.reset();
   isKeyFrame_ = false;
   const SamplePtr shown = GetFrame();
-  if (shown == nullptr) return PLAYER_ERROR_NONE;
+  if (shown == nullptr) {
+    if (exact) return PLAYER_ERROR_NONE;  // at the very end there is none
+    return PlayerFailure(PLAYER_ERROR_IO, __LINE__, "the file holds no frame near %ld ms",
+                         position);
+  }
   const GstClockTime stamp = GST_BUFFER_PTS(gst_sample_get_buffer(shown.get()));
   isKeyFrame_ = probe_->IsKeyFrame(stamp);
   if (!exact) {

@@ -53,9 +53,10 @@ class ZELKORA_MEDIA_API AudioVolumeManager : public Tizen::Base::Object {
   /// last result, which is `E_SUCCESS` otherwise:
   /// - `E_PRIVILEGE_DENIED`
   /// - `E_UNSUPPORTED_OPERATION` when the device lacks the feature, or the code of a failing lookup
-  /// - `E_OUT_OF_MEMORY` or `E_SYSTEM` when the manager couldn't be made. That is tried once in the
-  ///   life of a process: later calls, and the first ones of other threads, give null with
-  ///   `E_SUCCESS` in the last result. So do calls after the manager was deleted at exit.
+  /// - `E_OUT_OF_MEMORY`, `E_SYSTEM`, or the code with which the platform's events refuse to start,
+  ///   when the manager couldn't be made. That is tried once in the life of a process: later calls,
+  ///   and the first ones of other threads, give null with `E_SUCCESS` in the last result. So do
+  ///   calls after the manager was deleted at exit.
   static AudioVolumeManager* GetInstance();
 
   /// \name Volume ranges

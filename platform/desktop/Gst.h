@@ -2,19 +2,13 @@
 /// Owners of GStreamer's and GLib's things.
 #pragma once
 
+#include "FreeWith.h"
+
 #include <gst/gst.h>
 
 #include <memory>
 
 namespace Desktop {
-
-template <auto Free>
-struct FreeWith {
-  template <typename T>
-  void operator()(T* thing) const {
-    Free(thing);
-  }
-};
 
 using ElementPtr = std::unique_ptr<GstElement, FreeWith<gst_object_unref>>;
 using BusPtr = std::unique_ptr<GstBus, FreeWith<gst_object_unref>>;

@@ -2,6 +2,8 @@
 /// Owners for what libpulse hands out, and its error codes in the native interface's terms.
 #pragma once
 
+#include "../FreeWith.h"
+
 #include <pulse/ext-stream-restore.h>
 #include <pulse/pulseaudio.h>
 #include <sound_manager.h>
@@ -10,18 +12,10 @@
 
 namespace Desktop {
 
-template <auto free>
-struct PulseFree {
-  template <typename T>
-  void operator()(T* object) const {
-    free(object);
-  }
-};
-
-using ContextPtr = std::unique_ptr<pa_context, PulseFree<pa_context_unref>>;
-using StreamPtr = std::unique_ptr<pa_stream, PulseFree<pa_stream_unref>>;
-using OperationPtr = std::unique_ptr<pa_operation, PulseFree<pa_operation_unref>>;
-using PropertiesPtr = std::unique_ptr<pa_proplist, PulseFree<pa_proplist_free>>;
+using ContextPtr = std::unique_ptr<pa_context, FreeWith<pa_context_unref>>;
+using StreamPtr = std::unique_ptr<pa_stream, FreeWith<pa_stream_unref>>;
+using OperationPtr = std::unique_ptr<pa_operation, FreeWith<pa_operation_unref>>;
+using PropertiesPtr = std::unique_ptr<pa_proplist, FreeWith<pa_proplist_free>>;
 
 /// Codes that the native interface has no name for.
 inline constexpr int kFailed = -5;

@@ -28,10 +28,8 @@ namespace {
 using Zelkora::Media::AudioVolumeManager;
 using Clock = std::chrono::steady_clock;
 
-constexpr int kCalls = 2000;  // of each kind and side
-constexpr int kPactlCalls = 60;
-constexpr int kBlocks = 100;  // processes of each side that wait for changes
-constexpr int kChanges = 20;  // in each of them
+constexpr int kProcesses = 150;  // of each side
+constexpr int kRounds = 20;      // in each of them
 constexpr int kMax = 15;
 constexpr char kEntry[] = "sink-input-by-media-role:music";
 
@@ -213,72 +211,105 @@ class LibraryListener : public Zelkora::Media::IAudioVolumeEventListener {
   Waiter& waiter_;
 };
 
-/// A process of its own, so that no side makes work for the other: prints the times from a change by
-/// another client until the listener has the level.
-int PrintChangeTimes(bool withLibrary, int stream) {
-  static Waiter waiter;
-  static LibraryListener listener(waiter);
-  static Direct raw;
-  if (withLibrary) {
-    AudioVolumeManager* volume = AudioVolumeManager::GetInstance();
-    Require(volume->AddAudioVolumeEventListener(listener) == E_SUCCESS, "no listener");
-  } else {
-    raw.Watch([](int level) { waiter.Arrive(level); });
+// Each of these runs in a process of its own, so that no side makes work for another. It prints what
+// was measured and the time.
+
+void Print(const std::string& name, double time) { std::printf("%s %f\n", name.c_str(), time); }
+
+/// Sets and gets in any order.
+template <typename Set, typename Get>
+void PrintCalls(const std::string& side, Set set, Get get) {
+  std::mt19937 random(std::random_device{}());
+  for (int i = 0; i < 2 * kRounds; ++i) {
+    if (random() % 2 == 0) {
+      const int level = static_cast<int>(random() % kMax);
+      Print(side + "-set", Measure([&] { set(level); }));
+    } else {
+      Print(side + "-get", Measure(get));
+    }
   }
+}
+
+void PrintLibraryCalls(int) {
+  AudioVolumeManager* volume = AudioVolumeManager::GetInstance();
+  Require(volume != nullptr, "no volume manager");
+  PrintCalls(
+      "library", [&](int level) { volume->SetMediaVolumeLevel(level); },
+      [&] { volume->GetCurrentMediaVolumeLevel(); });
+}
+
+void PrintDirectCalls(int) {
+  Direct direct;
+  PrintCalls(
+      "direct", [&](int level) { direct.SetLevel(level); }, [&] { direct.GetLevel(); });
+}
+
+/// From a change by another client until the listener has the level.
+void PrintChanges(const char* name, int stream, Waiter& waiter) {
   Direct other;
-  for (int i = 0; i < kChanges; ++i) {
+  waiter.Expect(kMax);  // which isn't the level yet, whatever was measured before
+  other.SetStreamLevel(stream, kMax);
+  waiter.Await();
+  for (int i = 0; i < kRounds; ++i) {
     const int level = 1 + i % 2;
     waiter.Expect(level);
     const auto begin = Clock::now();
     other.SetStreamLevel(stream, level);
-    std::printf("%f\n", Microseconds(waiter.Await() - begin));
+    Print(name, Microseconds(waiter.Await() - begin));
   }
-  return 0;
 }
 
-std::vector<double> ReadTimes(const char* side, int stream) {
-  Program program({"/proc/self/exe", side, std::to_string(stream)});
-  std::vector<double> times;
-  for (std::string line = program.ReadLine(); !line.empty(); line = program.ReadLine()) {
-    times.push_back(std::stod(line));
-  }
-  Require(times.size() == kChanges, "a listening process fails");
-  return times;
+void PrintLibraryChanges(int stream) {
+  static Waiter waiter;
+  static LibraryListener listener(waiter);
+  AudioVolumeManager* volume = AudioVolumeManager::GetInstance();
+  Require(volume != nullptr, "no volume manager");
+  Require(volume->AddAudioVolumeEventListener(listener) == E_SUCCESS, "no listener");
+  PrintChanges("library-change", stream, waiter);
 }
+
+void PrintRawChanges(int stream) {
+  static Waiter waiter;
+  static Direct raw;
+  raw.Watch([](int level) { waiter.Arrive(level); });
+  PrintChanges("raw-change", stream, waiter);
+}
+
+constexpr std::pair<const char*, void (*)(int)> kSides[] = {
+    {"library-calls", PrintLibraryCalls},
+    {"direct-calls", PrintDirectCalls},
+    {"library-changes", PrintLibraryChanges},
+    {"raw-changes", PrintRawChanges},
+};
 
 using Samples = std::map<std::string, std::vector<double>>;
 
-void MeasureCalls(AudioVolumeManager& volume, int stream, Samples& samples) {
-  Direct direct;
-  std::mt19937 random(1);
-  std::vector<std::pair<const char*, std::function<void(int)>>> calls = {
-      {"library set", [&](int level) { volume.SetMediaVolumeLevel(level); }},
-      {"direct set", [&](int level) { direct.SetLevel(level); }},
-      {"library get", [&](int) { volume.GetCurrentMediaVolumeLevel(); }},
-      {"direct get", [&](int) { direct.GetLevel(); }},
-  };
-  for (int i = 0; i < kCalls; ++i) {
-    std::shuffle(calls.begin(), calls.end(), random);
-    for (const auto& [name, call] : calls) {
-      const int level = static_cast<int>(random() % (kMax + 1));
-      samples[name].push_back(Measure([&] { call(level); }));
-    }
-    if (i % (kCalls / kPactlCalls) != 0) continue;
-    samples["pactl"].push_back(Measure([&] {
-      Pactl({"set-sink-input-volume", std::to_string(stream), std::to_string(i % 100) + "%"});
-    }));
+void MeasureSide(const char* side, int stream, Samples& samples) {
+  Program program({"/proc/self/exe", side, std::to_string(stream)});
+  for (std::string line = program.ReadLine(); !line.empty(); line = program.ReadLine()) {
+    const std::size_t blank = line.find(' ');
+    samples[line.substr(0, blank)].push_back(std::stod(line.substr(blank)));
   }
+  Require(program.Finish() == 0, "a measuring process fails");
 }
 
-void MeasureChanges(int stream, Samples& samples) {
+void MeasurePactl(int stream, Samples& samples) {
+  samples["pactl"].push_back(Measure([=] {
+    Pactl({"set-sink-input-volume", std::to_string(stream), "40%"});
+  }));
+}
+
+Samples MeasureAll(int stream) {
+  Samples samples;
   std::mt19937 random(1);
   std::vector<const char*> sides;
-  for (int i = 0; i < kBlocks; ++i) sides.insert(sides.end(), {"library change", "raw change"});
+  for (const auto& [side, print] : kSides) sides.insert(sides.end(), kProcesses, side);
   std::shuffle(sides.begin(), sides.end(), random);
   for (const char* side : sides) {
-    const std::vector<double> times = ReadTimes(side, stream);
-    samples[side].insert(samples[side].end(), times.begin(), times.end());
+    MeasureSide(side, stream, samples);
+    if (random() % 4 == 0) MeasurePactl(stream, samples);
   }
+  return samples;
 }
 
 /// \return whether the ratio of the medians is at most \p limit
@@ -296,22 +327,18 @@ int RunAll(double callLimit, double changeLimit, double pactlLimit) {
   SoundServer server;
   server.Start();
   const Player player({"media.role=music"});
-  AudioVolumeManager* volume = AudioVolumeManager::GetInstance();
-  Require(volume != nullptr, "no volume manager");
-  Require(volume->SetMediaVolumeLevel(5) == E_SUCCESS, "the level can't be set");
-  Samples samples;
-  MeasureCalls(*volume, player.GetIndex(), samples);
-  MeasureChanges(player.GetIndex(), samples);
-  bool holds = Compare(samples, "library set", "direct set", callLimit);
-  holds = Compare(samples, "library get", "direct get", callLimit) && holds;
-  holds = Compare(samples, "library change", "raw change", changeLimit) && holds;
-  return Compare(samples, "library set", "pactl", 1 / pactlLimit) && holds ? 0 : 1;
+  Direct().SetStreamLevel(player.GetIndex(), 5);  // so that a level is stored
+  const Samples samples = MeasureAll(player.GetIndex());
+  bool holds = Compare(samples, "library-set", "direct-set", callLimit);
+  holds = Compare(samples, "library-get", "direct-get", callLimit) && holds;
+  holds = Compare(samples, "library-change", "raw-change", changeLimit) && holds;
+  return Compare(samples, "library-set", "pactl", 1 / pactlLimit) && holds ? 0 : 1;
 }
 
 int Run(int count, char** arguments) {
   const std::string first = count > 1 ? arguments[1] : "";
-  if (first == "library change" || first == "raw change") {
-    return PrintChangeTimes(first == "library change", std::stoi(arguments[2]));
+  for (const auto& [side, print] : kSides) {
+    if (first == side) return print(std::stoi(arguments[2])), 0;
   }
   const auto limit = [&](int index, double otherwise) {
     return count > index ? std::stod(arguments[index]) : otherwise;

@@ -101,6 +101,7 @@ result _Dispatcher::Fire(_Event& event, IEventArg& arg) {
   queue_.Append(*owned.release());
   const bool own = spent_.First() != nullptr && spent_.First()->__pEvent == &event;
   const std::unique_ptr<IEventArg> spent(own ? spent_.TakeFirst() : nullptr);
+  standby_.Notify();
   const bool wake = std::exchange(sleeping_, false);
   lock.unlock();
   if (wake) queued_.notify_one();
@@ -190,10 +191,17 @@ void _Dispatcher::Free(Arguments& arguments, std::unique_lock<std::mutex>& lock)
 void _Dispatcher::WaitForArguments() {
   std::unique_lock lock(queueMutex_);
   while (queue_.First() == nullptr && !stopped_) {
+    if (standby_.Wait(lock, [] {})) continue;
     sleeping_ = true;
     queued_.wait(lock);
   }
   sleeping_ = false;
+}
+
+void _Dispatcher::Expect() {
+  std::lock_guard lock(queueMutex_);
+  standby_.Expect();
+  if (std::exchange(sleeping_, false)) queued_.notify_one();
 }
 
 void _Dispatcher::Deliver(std::unique_ptr<IEventArg> arg, std::unique_lock<std::mutex>& lock) {
@@ -288,5 +296,7 @@ std::uint64_t _Dispatcher::OldestUndelivered() {
 }
 
 }  // namespace Tizen::Base::Runtime
+
+void Host::ExpectEvents() { Tizen::Base::Runtime::_Dispatcher::Get().Expect(); }
 
 void Host::WaitUntilDelivered() { Tizen::Base::Runtime::_Dispatcher::Get().WaitUntilDelivered(); }

@@ -2,6 +2,7 @@
 #pragma once
 
 #include "EventListeners.h"
+#include "Standby.h"
 
 #include <sys/types.h>
 
@@ -35,6 +36,9 @@ class _Dispatcher {
   void Close(_Event& event);
 
   void WaitUntilDelivered();
+
+  /// Arguments are likely to be fired soon.
+  void Expect();
 
  private:
   /// Arguments in the order of firing. Frees what it holds.
@@ -91,6 +95,7 @@ class _Dispatcher {
   Arguments spent_;
   std::uint64_t lastNumber_ = 0;
   bool sleeping_ = false;  // the dispatcher waits for arguments and must be woken
+  Host::Standby standby_;
   bool stopped_ = false;
   std::thread thread_;
   pid_t process_ = 0;

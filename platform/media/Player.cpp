@@ -44,9 +44,7 @@ _PlayerImpl::~_PlayerImpl() {
   if (__hPlayer != nullptr) player_destroy(__hPlayer);
 }
 
-result _PlayerImpl::Construct() {
-  return Report(player_create(&__hPlayer));
-}
+result _PlayerImpl::Construct() { return Report(player_create(&__hPlayer)); }
 
 result _PlayerImpl::SeekTo(long msTime, bool exact) {
   if (auto failure =

@@ -1,18 +1,16 @@
 #include "CallbackThread.h"
 
+#include <Host/Events.h>
+
 #include <unistd.h>
 
 #include <algorithm>
-#include <chrono>
 #include <cstdlib>
 #include <new>
 #include <utility>
 
 namespace Host {
 namespace {
-
-/// A local server answers in less.
-constexpr std::chrono::microseconds kAwake{300};
 
 thread_local bool onCallbackThread = false;
 
@@ -42,25 +40,14 @@ void CallbackThread::Post(const Report& report) {
   if (stopped_ || SlotOf(report.kind).callback == nullptr) return;
   queue_.push_back(report);
   ++postedCount_;
-  hasNews_.store(true, std::memory_order_release);
+  standby_.Notify();
   if (std::exchange(sleeping_, false)) queued_.notify_one();
 }
 
-void CallbackThread::Prepare(Kind kind) {
+void CallbackThread::Expect(Kind kind) {
   if (SlotOf(kind).callback == nullptr) return;
-  prepared_ = true;
+  standby_.Expect();
   if (std::exchange(sleeping_, false)) queued_.notify_one();
-}
-
-void CallbackThread::StayAwake(std::unique_lock<std::mutex>& lock) {
-  prepared_ = false;
-  hasNews_ = false;
-  lock.unlock();
-  const auto end = std::chrono::steady_clock::now() + kAwake;
-  while (!hasNews_.load(std::memory_order_acquire) && std::chrono::steady_clock::now() < end) {
-    std::this_thread::yield();
-  }
-  lock.lock();
 }
 
 void CallbackThread::DropReports() {
@@ -132,12 +119,9 @@ void CallbackThread::Run() {
 bool CallbackThread::TakeBatch() {
   std::unique_lock lock(mutex_);
   while (queue_.empty() && !stopped_) {
-    if (prepared_) {
-      StayAwake(lock);
-    } else {
-      sleeping_ = true;
-      queued_.wait(lock);
-    }
+    if (standby_.Wait(lock, ExpectEvents)) continue;
+    sleeping_ = true;
+    queued_.wait(lock);
   }
   sleeping_ = false;
   batch_.swap(queue_);

@@ -1,10 +1,11 @@
 /// \file
 #pragma once
 
+#include <appfw/Standby.h>
+
 #include <sys/types.h>
 
 #include <array>
-#include <atomic>
 #include <condition_variable>
 #include <cstdint>
 #include <functional>
@@ -50,9 +51,9 @@ class CallbackThread {
   /// done, when memory is short.
   void Post(const Report& report);
 
-  /// Keeps the thread awake for a moment, because a report is likely to come that somebody hears:
-  /// waking it up can take as long as a round trip to a server. The state's mutex must be held.
-  void Prepare(Kind kind);
+  /// A report is likely to come soon: keeps the thread awake for it, and the dispatcher of the events
+  /// that are made of it, if anybody hears it. The state's mutex must be held.
+  void Expect(Kind kind);
 
   /// Drops the reports that are queued. The state's mutex must not be held.
   void DropReports();
@@ -70,7 +71,6 @@ class CallbackThread {
   void Stop();
   void Run();
   bool TakeBatch();
-  void StayAwake(std::unique_lock<std::mutex>& lock);
   void Deliver(const Report& report, std::unique_lock<std::mutex>& lock);
   void Finish(std::uint64_t count);
   void WaitUntilFinished(std::uint64_t count, std::unique_lock<std::mutex>& lock);
@@ -82,8 +82,7 @@ class CallbackThread {
   std::vector<Report> queue_;
   std::uint64_t postedCount_ = 0;
   bool sleeping_ = false;
-  bool prepared_ = false;
-  std::atomic<bool> hasNews_{false};  // while it stays awake
+  Standby standby_;
   bool stopped_ = false;
   std::thread thread_;
   pid_t process_ = 0;

@@ -36,7 +36,7 @@ void Batch::Finish(int error) {
   if (error_ == PA_OK) error_ = error;
   if (--outstanding_ > 0) return;
   if (error_ == PA_OK) onSuccess_();
-  done_.notify_all();
+  loop_.NotifyProgress();
 }
 
 }  // namespace Desktop

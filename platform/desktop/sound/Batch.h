@@ -2,8 +2,8 @@
 #pragma once
 
 #include "Pulse.h"
+#include "PulseLoop.h"
 
-#include <condition_variable>
 #include <functional>
 #include <vector>
 
@@ -15,9 +15,8 @@ class Batch {
  public:
   /// \param onSuccess called on the loop's thread with the last answer, if no request was refused,
   /// and so in the order of all other answers
-  /// \param done notified when the last answer has come
-  Batch(std::condition_variable& done, std::function<void()> onSuccess)
-      : done_(done), onSuccess_(std::move(onSuccess)) {}
+  Batch(PulseLoop& loop, std::function<void()> onSuccess)
+      : loop_(loop), onSuccess_(std::move(onSuccess)) {}
   ~Batch();
 
   Batch(const Batch&) = delete;
@@ -42,7 +41,8 @@ class Batch {
     Keep(send(OnOptionalAnswer, this));
   }
 
-  /// Requests that couldn't be made have failed by the time this is asked.
+  /// The loop tells of progress when it changes. Requests that couldn't be made have failed by the
+  /// time this is asked.
   bool IsDone() const { return outstanding_ == 0; }
 
   /// \return the native code of the first refusal, or 0
@@ -56,7 +56,7 @@ class Batch {
   void Keep(pa_operation* operation);
   void Finish(int error);
 
-  std::condition_variable& done_;
+  PulseLoop& loop_;
   std::function<void()> onSuccess_;
   std::vector<OperationPtr> operations_;
   std::size_t outstanding_ = 0;

@@ -2,8 +2,6 @@
 
 #include "Log.h"
 
-#include <sys/time.h>
-
 #include <algorithm>
 
 namespace Desktop {
@@ -18,7 +16,7 @@ constexpr std::chrono::milliseconds kLongestPause{800};
 
 void Connection::Connect() {
   if (state_ != State::kDown) return;
-  CancelRetry();
+  retry_.Stop();
   state_ = State::kConnecting;
   ++number_;
   context_.reset(pa_context_new(loop_.GetApi(), "zelkora"));
@@ -30,7 +28,7 @@ void Connection::Connect() {
 }
 
 void Connection::Close() {
-  CancelRetry();
+  retry_.Stop();
   state_ = State::kClosed;
   error_ = PA_ERR_CONNECTIONTERMINATED;
   if (context_ != nullptr) {
@@ -71,23 +69,8 @@ void Connection::OnFailed(int error) {
 }
 
 void Connection::ScheduleRetry() {
-  timeval time;
-  pa_timeval_add(pa_gettimeofday(&time), static_cast<pa_usec_t>(pause_.count()) * PA_USEC_PER_MSEC);
-  pa_mainloop_api* api = loop_.GetApi();
-  if (retry_ == nullptr) {
-    retry_ = api->time_new(api, &time, OnRetryTime, this);
-  } else {
-    api->time_restart(retry_, &time);
-  }
+  retry_.Start(pause_);
   pause_ = std::clamp(2 * pause_, kFirstPause, kLongestPause);
-}
-
-void Connection::CancelRetry() {
-  if (retry_ != nullptr) loop_.GetApi()->time_restart(retry_, nullptr);
-}
-
-void Connection::OnRetryTime(pa_mainloop_api*, pa_time_event*, const timeval*, void* self) {
-  static_cast<Connection*>(self)->Connect();
 }
 
 }  // namespace Desktop

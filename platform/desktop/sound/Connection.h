@@ -2,7 +2,7 @@
 #pragma once
 
 #include "Pulse.h"
-#include "PulseLoop.h"
+#include "Timer.h"
 
 #include <chrono>
 
@@ -24,7 +24,8 @@ class Connection {
     ~Owner() = default;
   };
 
-  Connection(PulseLoop& loop, Owner& owner) : loop_(loop), owner_(owner) {}
+  Connection(PulseLoop& loop, Owner& owner)
+      : loop_(loop), owner_(owner), retry_(loop, [this] { Connect(); }) {}
 
   /// Begins to connect, unless connected or on the way to it.
   void Connect();
@@ -47,13 +48,10 @@ class Connection {
   enum class State { kDown, kConnecting, kUp, kClosed };
 
   static void OnStateChanged(pa_context* context, void* self);
-  static void OnRetryTime(pa_mainloop_api* api, pa_time_event* event, const timeval* time,
-                          void* self);
 
   void OnReady();
   void OnFailed(int error);
   void ScheduleRetry();
-  void CancelRetry();
 
   PulseLoop& loop_;
   Owner& owner_;
@@ -62,7 +60,7 @@ class Connection {
   unsigned number_ = 0;
   int error_ = PA_ERR_CONNECTIONREFUSED;
   bool isLossLogged_ = false;
-  pa_time_event* retry_ = nullptr;  // the loop's; lives as long as it
+  Timer retry_;
   std::chrono::milliseconds pause_{0};
 };
 

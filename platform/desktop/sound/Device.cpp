@@ -41,7 +41,7 @@ Device::Time Device::GetLimit() { return std::chrono::steady_clock::now() + kAns
 template <typename Condition>
 int Device::AwaitPicture(Lock& lock, Time limit, Condition condition) {
   const auto isDecided = [&] { return connection_.IsDown() || (isComplete_ && condition()); };
-  if (!progress_.wait_until(lock, limit, isDecided)) return kTimedOut;
+  if (!loop_.WaitForProgress(lock, limit, isDecided)) return kTimedOut;
   return connection_.IsDown() ? connection_.GetErrorCode() : SOUND_MANAGER_ERROR_NONE;
 }
 
@@ -50,26 +50,20 @@ int Device::AwaitPicture(Lock& lock, Time limit) {
   return AwaitPicture(lock, limit, [] { return true; });
 }
 
-bool Device::IsCurrent() {
-  return isComplete_ && questions_.AreAllAnswered() && !loop_.HasUnread();
-}
-
-int Device::AwaitAnswers(Lock& lock, Time limit) {
-  const std::uint64_t asked = questions_.GetAsked();
-  return AwaitPicture(lock, limit, [&] { return questions_.AreAnswered(asked); });
-}
-
-int Device::Refresh(Lock& lock, Time limit, void (Device::*ask)()) {
-  if (IsCurrent()) return SOUND_MANAGER_ERROR_NONE;
-  const bool isFresh = !isComplete_;
+int Device::ReadEvents(Lock& lock, Time limit) {
   if (const int error = AwaitPicture(lock, limit)) return error;
-  if (isFresh) return SOUND_MANAGER_ERROR_NONE;
-  if (const int error = AwaitAnswers(lock, limit)) return error;
-  if (IsCurrent()) return SOUND_MANAGER_ERROR_NONE;
-  (this->*ask)();
-  // The second time for what was asked because of events that came before the answer.
-  const int error = AwaitAnswers(lock, limit);
-  return error != SOUND_MANAGER_ERROR_NONE ? error : AwaitAnswers(lock, limit);
+  if (!loop_.AwaitReading(lock, limit)) return kTimedOut;
+  if (areVolumesDue_) AskForVolumes();
+  return SOUND_MANAGER_ERROR_NONE;
+}
+
+int Device::AwaitAnswers(Lock& lock, Time limit, std::uint64_t count) {
+  return AwaitPicture(lock, limit, [=] { return questions_.AreAnswered(count); });
+}
+
+int Device::Refresh(Lock& lock, Time limit) {
+  if (const int error = ReadEvents(lock, limit)) return error;
+  return AwaitAnswers(lock, limit, questions_.GetAsked());
 }
 
 int Device::Await(Lock& lock, Time limit, const Batch& batch) {
@@ -77,7 +71,7 @@ int Device::Await(Lock& lock, Time limit, const Batch& batch) {
   const auto isLost = [&] {
     return connection_.GetContext() == nullptr || connection_.GetNumber() != connection;
   };
-  if (!progress_.wait_until(lock, limit, [&] { return batch.IsDone() || isLost(); })) {
+  if (!loop_.WaitForProgress(lock, limit, [&] { return batch.IsDone() || isLost(); })) {
     return kTimedOut;
   }
   return batch.IsDone() ? batch.GetErrorCode() : int{SOUND_MANAGER_ERROR_NO_CONNECTION};
@@ -87,9 +81,10 @@ int Device::SetLevel(Category category, int level) {
   Lock lock(loop_.GetMutex());
   const Time limit = GetLimit();
   // What is stored is written as a whole, so what others have changed in it must be known.
-  if (const int error = Refresh(lock, limit, &Device::AskForVolumes)) return error;
+  if (const int error = ReadEvents(lock, limit)) return error;
+  if (const int error = AwaitAnswers(lock, limit, volumesQuestion_)) return error;
   if (!volumes_.AreStored()) return SOUND_MANAGER_ERROR_INVALID_OPERATION;
-  Batch batch(progress_, [=] { volumes_.OnDone(category, level); });
+  Batch batch(loop_, [=] { volumes_.OnDone(category, level); });
   volumes_.Send(connection_.GetContext(), category, level, !isPipeWire_, batch);
   ++ownWrites_;
   const int error = Await(lock, limit, batch);
@@ -100,7 +95,7 @@ int Device::SetLevel(Category category, int level) {
 
 int Device::GetLevel(Category category, int& level) {
   Lock lock(loop_.GetMutex());
-  if (const int error = Refresh(lock, GetLimit(), &Device::AskForVolumes)) return error;
+  if (const int error = Refresh(lock, GetLimit())) return error;
   if (!volumes_.AreStored()) return SOUND_MANAGER_ERROR_INVALID_OPERATION;
   level = volumes_.GetLevel(category);
   return SOUND_MANAGER_ERROR_NONE;
@@ -110,7 +105,7 @@ int Device::SetMuteAll(bool isMuted) {
   Lock lock(loop_.GetMutex());
   const Time limit = GetLimit();
   if (const int error = AwaitPicture(lock, limit)) return error;
-  Batch batch(progress_, [=] { output_.OnMuted(isMuted); });
+  Batch batch(loop_, [=] { output_.OnMuted(isMuted); });
   batch.Add([&](pa_context_success_cb_t onAnswer, void* data) {
     return pa_context_set_sink_mute_by_name(connection_.GetContext(), Output::kName, isMuted,
                                             onAnswer, data);
@@ -120,7 +115,7 @@ int Device::SetMuteAll(bool isMuted) {
 
 int Device::GetMuteAll(bool& isMuted) {
   Lock lock(loop_.GetMutex());
-  if (const int error = Refresh(lock, GetLimit(), &Device::AskForOutput)) return error;
+  if (const int error = Refresh(lock, GetLimit())) return error;
   if (!output_.Exists()) return SOUND_MANAGER_ERROR_INVALID_OPERATION;
   isMuted = output_.IsMuted();
   return SOUND_MANAGER_ERROR_NONE;
@@ -161,7 +156,7 @@ int Device::AwaitOpenCall(Lock& lock, Time limit, int number) {
     const CallSession* call = FindCall(number);
     return call == nullptr || !call->IsOpening() || connection_.GetNumber() != connection;
   };
-  if (!progress_.wait_until(lock, limit, isDecided)) return kTimedOut;
+  if (!loop_.WaitForProgress(lock, limit, isDecided)) return kTimedOut;
   const CallSession* call = FindCall(number);
   if (call == nullptr) return SOUND_MANAGER_ERROR_INVALID_PARAMETER;
   if (call->IsOpen()) return SOUND_MANAGER_ERROR_NONE;
@@ -175,7 +170,7 @@ int Device::CloseCall(int number) {
   if (node.empty()) return SOUND_MANAGER_ERROR_INVALID_PARAMETER;
   CallSession& call = node.mapped();
   call.Close();
-  progress_.wait_until(lock, GetLimit(), [&] { return !call.IsOpen() && !call.IsOpening(); });
+  loop_.WaitForProgress(lock, GetLimit(), [&] { return !call.IsOpen() && !call.IsOpening(); });
   return SOUND_MANAGER_ERROR_NONE;
 }
 
@@ -186,7 +181,7 @@ int Device::SetCallMode(int number, int mode) {
   if (const int error = AwaitPicture(lock, limit)) return error;
   if (FindCall(number) == nullptr) return SOUND_MANAGER_ERROR_INVALID_PARAMETER;
   if (const int error = AwaitOpenCall(lock, limit, number)) return error;
-  Batch batch(progress_, [=] {
+  Batch batch(loop_, [=] {
     if (CallSession* call = FindCall(number)) call->SetMode(mode);
   });
   FindCall(number)->SendMode(mode, batch);

@@ -14,7 +14,6 @@
 
 #include <sys/types.h>
 
-#include <condition_variable>
 #include <map>
 #include <mutex>
 
@@ -63,15 +62,14 @@ class Device final : private Connection::Owner, private CallSession::Owner {
   /// Waits until there is a picture, as the server told it last. \return a native code
   int AwaitPicture(Lock& lock, Time limit);
 
-  /// Waits until what has been asked is answered. \return a native code
-  int AwaitAnswers(Lock& lock, Time limit);
+  /// Waits until all that the server has sent has been read, and asks about it. \return a native code
+  int ReadEvents(Lock& lock, Time limit);
 
-  /// \return whether everything that the server has sent is in the picture
-  bool IsCurrent();
+  /// Waits until that many questions are answered. \return a native code
+  int AwaitAnswers(Lock& lock, Time limit, std::uint64_t count);
 
-  /// Waits until the picture is as the server was when this was called. Asks a question, unless
-  /// everything that was sent has been read. \return a native code
-  int Refresh(Lock& lock, Time limit, void (Device::*ask)());
+  /// Waits until the picture is as the server was when this was called. \return a native code
+  int Refresh(Lock& lock, Time limit);
 
   /// Waits for the answers to a batch. \return a native code
   int Await(Lock& lock, Time limit, const Batch& batch);
@@ -82,7 +80,7 @@ class Device final : private Connection::Owner, private CallSession::Owner {
 
   void OnConnected(pa_context* context) override;
   void OnDisconnected(bool isLost) override;
-  void OnCallChanged() override { progress_.notify_all(); }
+  void OnCallChanged() override { loop_.NotifyProgress(); }
   void OnCallKilled() override { reports_.ReportInterruption(kTakenOver); }
 
   void OnAnswered();
@@ -91,6 +89,7 @@ class Device final : private Connection::Owner, private CallSession::Owner {
   void AskForOutput();
   void AskForStream(std::uint32_t index);
   void AskForVolumes();
+  void AskForVolumesSoon();
   void AskForChangesOfVolumes();
 
   /// \name Events of the server
@@ -114,7 +113,6 @@ class Device final : private Connection::Owner, private CallSession::Owner {
   /// @}
 
   PulseLoop loop_;
-  std::condition_variable progress_;  // with the loop's lock
   Reports reports_;
   Connection connection_{loop_, *this};
   Questions questions_;
@@ -122,6 +120,9 @@ class Device final : private Connection::Owner, private CallSession::Owner {
   bool isPipeWire_ = false;
   Streams streams_;
   Volumes volumes_{reports_, streams_};
+  bool areVolumesDue_ = false;
+  std::uint64_t volumesQuestion_ = 0;  // the last one's number
+  Timer volumesTimer_{loop_, [this] { AskForVolumes(); }};
   int ownWrites_ = 0;  // of stored volumes, whose events haven't come yet
   Output output_{reports_, streams_};
   Interruptions interruptions_{reports_, streams_};

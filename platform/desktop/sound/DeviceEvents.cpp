@@ -5,6 +5,7 @@
 #include "Log.h"
 
 #include <cstring>
+#include <utility>
 
 namespace Desktop {
 namespace {
@@ -12,6 +13,9 @@ namespace {
 constexpr auto kWatched = static_cast<pa_subscription_mask_t>(
     PA_SUBSCRIPTION_MASK_SERVER | PA_SUBSCRIPTION_MASK_SINK | PA_SUBSCRIPTION_MASK_SINK_INPUT |
     PA_SUBSCRIPTION_MASK_MODULE);
+
+/// How long stored volumes may wait to be asked for.
+constexpr std::chrono::milliseconds kVolumesPause{10};
 
 Device& ToDevice(void* self) { return *static_cast<Device*>(self); }
 
@@ -34,11 +38,13 @@ void Device::OnConnected(pa_context* context) {
 void Device::OnDisconnected(bool isLost) {
   isComplete_ = false;
   questions_.Forget();
+  areVolumesDue_ = false;
+  volumesTimer_.Stop();
   streams_.Clear();
   output_.OnNone();
   for (auto& [number, call] : calls_) call.Drop();
   if (isLost) interruptions_.OnServerLost();
-  progress_.notify_all();
+  loop_.NotifyProgress();
 }
 
 void Device::OpenCalls() {
@@ -50,14 +56,29 @@ void Device::AskForOutput() {
       pa_context_get_sink_info_by_name(connection_.GetContext(), Output::kName, OnOutput, this));
 }
 
+/// What happens to a stream before its answer is sent is in the answer: one question at a time will do.
 void Device::AskForStream(std::uint32_t index) {
-  questions_.Ask(pa_context_get_sink_input_info(connection_.GetContext(), index, OnStream, this));
+  Stream* stream = streams_.Find(index);
+  if (stream != nullptr && stream->isBeingRead) return;
+  const bool isAsked = questions_.Ask(
+      pa_context_get_sink_input_info(connection_.GetContext(), index, OnStream, this));
+  if (stream != nullptr) stream->isBeingRead = isAsked;
 }
 
 void Device::AskForVolumes() {
+  areVolumesDue_ = false;
+  volumesTimer_.Stop();
   // PipeWire acknowledges a write before it can be read, and so would seem to take it back.
   if (isPipeWire_ && isComplete_) return;
   questions_.Ask(pa_ext_stream_restore_read(connection_.GetContext(), OnVolume, this));
+  volumesQuestion_ = questions_.GetAsked();
+}
+
+/// While streams are being asked, their answers are likely to tell the same. The question makes work
+/// for the server, which somebody who drags a slider would feel.
+void Device::AskForVolumesSoon() {
+  if (questions_.AreAllAnswered()) return AskForVolumes();
+  if (!std::exchange(areVolumesDue_, true)) volumesTimer_.Start(kVolumesPause);
 }
 
 /// Without the module that keeps volumes this is refused, so it is asked again when modules come.
@@ -69,7 +90,7 @@ void Device::AskForChangesOfVolumes() {
 void Device::OnAnswered() {
   questions_.OnAnswered();
   if (questions_.AreAllAnswered()) isComplete_ = true;
-  progress_.notify_all();
+  loop_.NotifyProgress();
 }
 
 void Device::OnEvent(pa_context*, pa_subscription_event_type_t event, std::uint32_t index,
@@ -91,7 +112,7 @@ void Device::OnStoredVolumesChanged(pa_context*, void* self) {
   if (device.ownWrites_ > 0) {
     --device.ownWrites_;  // what it changes will be known from the answer
   } else {
-    device.AskForVolumes();
+    device.AskForVolumesSoon();
   }
 }
 
@@ -104,9 +125,11 @@ void Device::OnSinkEvent(int type, std::uint32_t index) {
 
 void Device::OnStreamEvent(int type, std::uint32_t index) {
   if (type == PA_SUBSCRIPTION_EVENT_REMOVE) return OnStreamRemoved(index);
-  if (Stream* stream = streams_.Find(index)) stream->isBeingRead = true;
   AskForStream(index);
-  reports_.PrepareForLevel();
+  Stream* stream = streams_.Find(index);
+  if (stream != nullptr && std::exchange(stream->isEchoDue, false)) return;
+  // Not at once, because waking threads up takes time: the server has its question first.
+  loop_.CallWhenIdle([this] { reports_.ExpectLevel(); });
 }
 
 void Device::OnStreamRemoved(std::uint32_t index) {

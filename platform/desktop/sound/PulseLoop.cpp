@@ -4,6 +4,7 @@
 
 #include <csignal>
 #include <new>
+#include <utility>
 
 namespace Desktop {
 namespace {
@@ -48,10 +49,47 @@ void PulseLoop::Run() {
 int PulseLoop::Poll(pollfd* files, unsigned long count, int timeout, void* self) {
   auto& loop = *static_cast<PulseLoop*>(self);
   loop.files_.assign(files, files + count);
+  if (loop.onIdle_ != nullptr) std::exchange(loop.onIdle_, nullptr)();
+  loop.isDispatching_ = false;
+  ++loop.turns_;
+  const bool hasProgress = std::exchange(loop.hasProgress_, false) || loop.readers_ > 0;
   loop.mutex_.unlock();
+  if (hasProgress) loop.TellProgress();
   const int ready = poll(files, count, timeout);
   loop.mutex_.lock();
+  loop.isDispatching_ = true;
   return ready;
+}
+
+/// Who is woken while the lock is held wakes up twice.
+void PulseLoop::NotifyProgress() {
+  if (isDispatching_) {
+    hasProgress_ = true;
+  } else {
+    TellProgress();
+  }
+}
+
+void PulseLoop::TellProgress() {
+  ++progressCount_;
+  progress_.notify_all();
+}
+
+void PulseLoop::WaitAwake(std::unique_lock<std::mutex>& lock, Time end) {
+  const unsigned count = progressCount_;
+  lock.unlock();
+  while (progressCount_ == count && Clock::now() < end) std::this_thread::yield();
+  lock.lock();
+}
+
+bool PulseLoop::AwaitReading(std::unique_lock<std::mutex>& lock, Time limit) {
+  bool isInTime = true;
+  ++readers_;
+  while (isInTime && HasUnread()) {
+    isInTime = WaitForProgress(lock, limit, [this, turn = turns_] { return turns_ != turn; });
+  }
+  --readers_;
+  return isInTime;
 }
 
 bool PulseLoop::HasUnread() { return poll(files_.data(), files_.size(), 0) != 0; }

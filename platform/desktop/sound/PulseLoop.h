@@ -4,6 +4,11 @@
 #include <poll.h>
 #include <pulse/mainloop.h>
 
+#include <algorithm>
+#include <atomic>
+#include <chrono>
+#include <condition_variable>
+#include <functional>
 #include <mutex>
 #include <thread>
 #include <vector>
@@ -17,26 +22,56 @@ namespace Desktop {
 /// to read. Never destroyed: callers come until the process is gone.
 class PulseLoop {
  public:
+  using Clock = std::chrono::steady_clock;
+  using Time = Clock::time_point;
+
   /// Throws when memory or threads are short.
   PulseLoop();
 
   std::mutex& GetMutex() { return mutex_; }
   pa_mainloop_api* GetApi() { return pa_mainloop_get_api(loop_); }
 
-  /// \return whether the server may have sent something that the thread hasn't come to yet. The lock
-  /// must be held.
-  bool HasUnread();
+  /// Waits until the thread has read all that the server has sent. \return false when it doesn't in time
+  bool AwaitReading(std::unique_lock<std::mutex>& lock, Time limit);
+
+  /// Wakes those who wait for progress. The lock must be held.
+  void NotifyProgress();
+
+  /// Waits until \p condition holds, which progress may change. \return false when it doesn't in time
+  template <typename Condition>
+  bool WaitForProgress(std::unique_lock<std::mutex>& lock, Time limit, Condition condition) {
+    const Time end = std::min(limit, Clock::now() + kMoment);
+    while (!condition() && Clock::now() < end) WaitAwake(lock, end);
+    return progress_.wait_until(lock, limit, condition);
+  }
+
+  /// Calls a function once, on the thread, when everything is sent and it comes to wait for the
+  /// server; the last one that was given. The lock must be held, and is then.
+  void CallWhenIdle(std::function<void()> function) { onIdle_ = std::move(function); }
 
   /// Ends the thread. The lock must not be held, and goes on working.
   void Stop();
 
  private:
+  /// A local server answers in less, and waking up would take as long again.
+  static constexpr std::chrono::microseconds kMoment{300};
+
   static int Poll(pollfd* files, unsigned long count, int timeout, void* self);
   void Run();
+  void WaitAwake(std::unique_lock<std::mutex>& lock, Time end);
+  void TellProgress();
+  bool HasUnread();
 
   std::mutex mutex_;
   pa_mainloop* loop_;
   std::vector<pollfd> files_;  // that the thread waits for, or waited for last
+  std::function<void()> onIdle_;
+  std::condition_variable progress_;
+  std::atomic<unsigned> progressCount_{0};  // for those who wait awake
+  bool isDispatching_ = false;              // the thread holds the lock
+  unsigned turns_ = 0;
+  int readers_ = 0;           // callers that wait for the thread's next turn
+  bool hasProgress_ = false;  // it has to wake those who wait
   std::thread thread_;
 };
 

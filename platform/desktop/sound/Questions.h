@@ -12,9 +12,11 @@ namespace Desktop {
 /// came. Under the loop's lock.
 class Questions {
  public:
-  /// Counts a question, unless it couldn't be asked.
-  void Ask(pa_operation* operation) {
-    if (OperationPtr(operation) != nullptr) ++asked_;
+  /// Counts a question. \return false when it couldn't be asked
+  bool Ask(pa_operation* operation) {
+    if (OperationPtr(operation) == nullptr) return false;
+    ++asked_;
+    return true;
   }
 
   void OnAnswered() { ++answered_; }

@@ -16,9 +16,9 @@ void Reports::ReportMuteAll(bool isMuted) noexcept { Post(Kind::kMuteAll, isMute
 
 void Reports::ReportInterruption(int code) noexcept { Post(Kind::kInterruption, code, 0); }
 
-void Reports::PrepareForLevel() noexcept {
+void Reports::ExpectLevel() noexcept {
   std::lock_guard lock(mutex_);
-  thread_.Prepare(Kind::kVolume);
+  thread_.Expect(Kind::kVolume);
 }
 
 void Reports::Post(Kind kind, int first, int second) noexcept try {

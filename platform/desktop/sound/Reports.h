@@ -20,7 +20,7 @@ class Reports {
   /// @}
 
   /// A level is likely to be reported at once.
-  void PrepareForLevel() noexcept;
+  void ExpectLevel() noexcept;
 
   /// Throws when memory or threads are short.
   void Set(Host::Kind kind, Callback callback) { thread_.Set(kind, std::move(callback)); }

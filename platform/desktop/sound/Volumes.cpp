@@ -132,6 +132,7 @@ void Volumes::OnDone(Category category, int level) {
   for (auto& [index, stream] : streams_.All()) {
     if (stream.category == category && stream.canChangeVolume) {
       stream.volume = Scale(stream.volume, level);
+      stream.isEchoDue = true;
     }
   }
   Change(category, level);

@@ -4,10 +4,10 @@
 #include "Failure.h"
 #include "Managers.h"
 #include "Output.h"
-#include "Steering.h"
 
 #include <Host/Calls.h>
 #include <Host/Capabilities.h>
+#include <Host/Events.h>
 #include <fmt/format.h>
 #include <poll.h>
 
@@ -179,7 +179,7 @@ void Shell::End(int code) {
 }
 
 void Shell::Settle() {
-  if (Steering::IsPossible()) Steering::WaitUntilDelivered();
+  Host::WaitUntilDelivered();
   PrintReports();
 }
 

@@ -8,16 +8,14 @@ namespace Simulated {
 void ReportVolume(int type, int level) __attribute__((weak));
 void ReportMuteAll(bool muteall) __attribute__((weak));
 void Interrupt(int code) __attribute__((weak));
-void WaitUntilDelivered() __attribute__((weak));
 }  // namespace Simulated
 
 namespace CommandLine::Steering {
 
-bool IsPossible() noexcept { return &Simulated::WaitUntilDelivered != nullptr; }
+bool IsPossible() noexcept { return &Simulated::Interrupt != nullptr; }
 
 void ReportVolume(int type, int level) { Simulated::ReportVolume(type, level); }
 void ReportMuteAll(bool muted) { Simulated::ReportMuteAll(muted); }
 void Interrupt(int code) { Simulated::Interrupt(code); }
-void WaitUntilDelivered() { Simulated::WaitUntilDelivered(); }
 
 }  // namespace CommandLine::Steering

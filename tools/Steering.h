@@ -9,6 +9,5 @@ bool IsPossible() noexcept;
 void ReportVolume(int type, int level);
 void ReportMuteAll(bool muted);
 void Interrupt(int code);
-void WaitUntilDelivered();
 
 }  // namespace CommandLine::Steering

@@ -19,6 +19,8 @@ constexpr int kLogModule = 1;
 
 thread_local bool onDispatcherThread = false;
 
+std::atomic<void (*)()> deviceWait{nullptr};
+
 }  // namespace
 
 void _Dispatcher::Arguments::Clear() {
@@ -270,7 +272,6 @@ void _Dispatcher::WaitWhile(std::unique_lock<std::mutex>& lock, Condition condit
 }
 
 void _Dispatcher::WaitUntilDelivered() {
-  if (onDispatcherThread) return;
   std::unique_lock lock(mutex_);
   std::unique_lock queueLock(queueMutex_);
   const std::uint64_t last = lastNumber_;
@@ -299,4 +300,11 @@ std::uint64_t _Dispatcher::OldestUndelivered() {
 
 void Host::ExpectEvents() { Tizen::Base::Runtime::_Dispatcher::Get().Expect(); }
 
-void Host::WaitUntilDelivered() { Tizen::Base::Runtime::_Dispatcher::Get().WaitUntilDelivered(); }
+void Host::SetDeviceWait(void (*wait)()) { Tizen::Base::Runtime::deviceWait = wait; }
+
+void Host::WaitUntilDelivered() {
+  using namespace Tizen::Base::Runtime;
+  if (onDispatcherThread) return;
+  if (const auto wait = deviceWait.load()) wait();
+  _Dispatcher::Get().WaitUntilDelivered();
+}

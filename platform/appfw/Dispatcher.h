@@ -35,6 +35,7 @@ class _Dispatcher {
   /// Ends an event, as its destructor promises.
   void Close(_Event& event);
 
+  /// Not to be called on the dispatcher's thread.
   void WaitUntilDelivered();
 
   /// Arguments are likely to be fired soon.

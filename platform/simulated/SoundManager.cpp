@@ -47,6 +47,10 @@ struct Device {
   int lastCallSession = 0;
   CallbackThread callbacks{mutex};
 
+  Device() {
+    Host::SetDeviceWait([] { Get().callbacks.WaitUntilReported(); });
+  }
+
   /// Never destroyed: callers may come until the process is gone.
   static Device& Get() {
     alignas(Device) static unsigned char memory[sizeof(Device)];
@@ -322,11 +326,6 @@ std::vector<int> GetCallSessionModes() {
   std::vector<int> modes;
   for (const auto& [number, mode] : device.callSessions) modes.push_back(mode);
   return modes;
-}
-
-void WaitUntilDelivered() {
-  Device::Get().callbacks.WaitUntilReported();
-  Host::WaitUntilDelivered();
 }
 
 void ResetSoundManager() {

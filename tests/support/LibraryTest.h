@@ -2,6 +2,7 @@
 #pragma once
 
 #include "LogCapture.h"
+#include "World.h"
 
 #include <Simulated/Device.h>
 
@@ -29,18 +30,18 @@ inline constexpr struct {
                         {E_SYSTEM, E_SYSTEM},
                         {kForeign, kForeign}};
 
-/// A test of the library on a fresh simulated device, with log and platform calls captured and
+/// A test of the library on a fresh device, with log and platform calls captured and
 /// assertions returning.
 class LibraryTest : public testing::Test {
  protected:
   LibraryTest() {
-    Simulated::Reset();
+    World::Reset();
     Host::SetAssertionAction(Host::AssertionAction::kReturn);
     Forget();
   }
   ~LibraryTest() override {
-    Simulated::WaitUntilDelivered();  // lest the next test hears it
-    Simulated::Reset();
+    Host::WaitUntilDelivered();  // lest the next test hears it
+    World::Reset();
   }
 
   /// Begins afresh what `ExpectLeft` sees.
@@ -56,7 +57,7 @@ class LibraryTest : public testing::Test {
                   int line = __builtin_LINE()) {
     testing::ScopedTrace trace("", line, "what was left behind");
     EXPECT_STREQ(GetErrorMessage(GetLastResult()), GetErrorMessage(last));
-    Simulated::WaitUntilDelivered();
+    Host::WaitUntilDelivered();
     EXPECT_THAT(log.Take(), testing::ElementsAreArray(lines));
     Lines made = Host::TakeCalls();
     made.erase(std::remove(made.begin(), made.end(), "_Event::FireAsync()"), made.end());

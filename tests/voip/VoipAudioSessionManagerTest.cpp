@@ -9,7 +9,6 @@ using testing::ElementsAre;
 using testing::IsEmpty;
 
 constexpr char kCreate[] = "sound_manager_call_session_create(1)";
-constexpr char kDestroy[] = "sound_manager_call_session_destroy(1)";
 
 const std::string kNotEntered =
     Sys(E_INVALID_STATE, "[E_INVALID_STATE] EnterCallSession() should be called before use");
@@ -25,13 +24,15 @@ std::string Refused(result r, const std::string& function, const std::string& ta
       r, " Failed to perform sound_manager_call_session_" + function + " operation" + tail);
 }
 
+std::string Code(const char* hex) { return std::string(" with error code : ") + hex; }
+
 VoipAudioSessionMode Mode(int value) { return static_cast<VoipAudioSessionMode>(value); }
 
 class NoCall : public ManagerTest<Call> {
  protected:
   ~NoCall() override {
     Host::ClearFailures();
-    if (!Simulated::GetCallSessionModes().empty()) manager.ExitCallSession();
+    if (!World::GetCallModes().empty()) manager.ExitCallSession();
   }
 };
 
@@ -47,24 +48,13 @@ TEST_F(NoCall, LeavesNothingToExitAndNoModeToSetOrGet) {
 }
 
 TEST_F(NoCall, CreationThatFailsLeavesNeitherACallNorASession) {
-  const auto expectFailure = [this](result r, const std::string& line, const Lines& calls) {
-    EXPECT_EQ(manager.EnterCallSession(), r);
-    ExpectLeftBehindGate(r, {line}, calls);
-    EXPECT_THAT(Simulated::GetCallSessionModes(), IsEmpty());
-    EXPECT_EQ(manager.GetCallSessionMode(), VOIP_AUDIO_SESSION_MODE_NONE);
-    ExpectLeftBehindGate(E_INVALID_STATE, {kNotEntered});
-  };
-  const std::string code = " with error code : ";
   for (const auto& failure : kPlatformFailures) {
     Host::FailCall("sound_manager_call_session_create", failure.code, 1);
-    expectFailure(failure.r, Refused(failure.r, "create", code + failure.hex), {kCreate});
+    EXPECT_EQ(manager.EnterCallSession(), failure.r);
+    ExpectLeftBehindGate(failure.r, {Refused(failure.r, "create", Code(failure.hex))}, {kCreate});
+    EXPECT_THAT(World::GetCallModes(), IsEmpty());
   }
-  Simulated::SetCallSessionFault(Simulated::CallSessionFault::kNoSession);
-  expectFailure(E_SYSTEM, Handle(E_SYSTEM, "system error", "null"), {kCreate});
-  Simulated::SetCallSessionFault(Simulated::CallSessionFault::kSessionRemains);
-  expectFailure(E_INVALID_OPERATION, Refused(E_INVALID_OPERATION, "create", code + "0xffffffda"),
-                {kCreate, kDestroy});
-  Simulated::SetCallSessionFault(Simulated::CallSessionFault::kNone);
+  EXPECT_EQ(manager.GetCallSessionMode(), VOIP_AUDIO_SESSION_MODE_NONE);
   EXPECT_EQ(manager.EnterCallSession(), E_SUCCESS);
 }
 
@@ -73,14 +63,25 @@ class InCall : public NoCall {
   InCall() {
     EXPECT_EQ(manager.EnterCallSession(), E_SUCCESS);
     Forget();
+    manager.GetCallSessionMode();
+    const std::string query = Host::TakeCalls().back();
+    number_ = query.substr(query.find('(') + 1, query.find(')') - query.find('(') - 1);
   }
+
+  /// \return the record of a call of the platform about the session
+  std::string Record(const std::string& function, const std::string& rest = "") const {
+    return "sound_manager_call_session_" + function + "(" + number_ + rest + ")";
+  }
+
+ private:
+  std::string number_;  // the platform's
 };
 
 TEST_F(InCall, CantBeEnteredAgainAndGoesOnUntilItIsExited) {
   EXPECT_EQ(manager.EnterCallSession(), E_INVALID_OPERATION);
   ExpectLeftBehindGate(E_INVALID_OPERATION, {Handle(E_INVALID_OPERATION, "error", "not null")});
   EXPECT_EQ(manager.ExitCallSession(), E_SUCCESS);
-  EXPECT_THAT(Simulated::GetCallSessionModes(), IsEmpty());
+  EXPECT_THAT(World::GetCallModes(), IsEmpty());
   EXPECT_EQ(manager.EnterCallSession(), E_SUCCESS);
 }
 
@@ -91,7 +92,7 @@ TEST_F(InCall, ModesReachThePlatformAndComeBackAndOthersAreRefusedHere) {
   for (const auto& row : rows) {
     SCOPED_TRACE(row.mode);
     EXPECT_EQ(manager.SetCallSessionMode(Mode(row.mode)), E_SUCCESS);
-    EXPECT_THAT(Simulated::GetCallSessionModes(), ElementsAre(row.platformMode));
+    EXPECT_THAT(World::GetCallModes(), ElementsAre(row.platformMode));
     EXPECT_EQ(manager.GetCallSessionMode(), row.readBack);
   }
   Forget();
@@ -111,15 +112,13 @@ TEST_F(InCall, DevicesRefusalChangesNothing) {
     Forget();
     Host::FailCall("sound_manager_call_session_set_mode", code, 1);
     EXPECT_EQ(manager.SetCallSessionMode(VOIP_AUDIO_SESSION_MODE_VOICE), r);
-    ExpectLeftBehindGate(r, {Refused(r, "set_mode", ".")},
-                         {"sound_manager_call_session_set_mode(1, 0)"});
+    ExpectLeftBehindGate(r, {Refused(r, "set_mode", ".")}, {Record("set_mode", ", 0")});
     Host::FailCall("sound_manager_call_session_get_mode", code, 1);
     EXPECT_EQ(manager.GetCallSessionMode(), VOIP_AUDIO_SESSION_MODE_NONE);
-    ExpectLeftBehindGate(r, {Refused(r, "get_mode", std::string(" with error code : ") + hex)},
-                         {"sound_manager_call_session_get_mode(1)"});
+    ExpectLeftBehindGate(r, {Refused(r, "get_mode", Code(hex))}, {Record("get_mode")});
     Host::FailCall("sound_manager_call_session_destroy", code, 1);
     EXPECT_EQ(manager.ExitCallSession(), r);
-    ExpectLeftBehindGate(r, {Refused(r, "destroy", ".")}, {kDestroy});
+    ExpectLeftBehindGate(r, {Refused(r, "destroy", ".")}, {Record("destroy")});
     EXPECT_EQ(manager.GetCallSessionMode(), VOIP_AUDIO_SESSION_MODE_MEDIA);
   }
 }

@@ -1,5 +1,7 @@
 #include "Device.h"
 
+#include <Host/Events.h>
+
 #include <unistd.h>
 
 namespace Desktop {
@@ -25,7 +27,10 @@ Device& Device::Get() {
   return made;
 }
 
-Device::Device() : process_(getpid()) { device = this; }
+Device::Device() : process_(getpid()) {
+  device = this;
+  Host::SetDeviceWait([] { device->AwaitReports(); });
+}
 
 void Device::Stop() {
   if (getpid() != process_) return;  // a forked child that ends: the thread stayed with the parent
@@ -127,6 +132,14 @@ void Device::SetCallback(Host::Kind kind, Reports::Callback callback) {
   AwaitPicture(lock, GetLimit());
   reports_.Set(kind, std::move(callback));
   if (kind == Host::Kind::kInterruption) interruptions_.Repeat();
+}
+
+void Device::AwaitReports() {
+  {
+    Lock lock(loop_.GetMutex());
+    if (connection_.GetContext() != nullptr) Refresh(lock, GetLimit());
+  }
+  reports_.AwaitCallbacks();
 }
 
 CallSession* Device::FindCall(int number) {

@@ -39,6 +39,9 @@ class Device final : private Connection::Owner, private CallSession::Owner {
   void SetCallback(Host::Kind kind, Reports::Callback callback);
   void UnsetCallback(Host::Kind kind) { reports_.Unset(kind); }
 
+  /// Waits until what the server has sent has been told to the program.
+  void AwaitReports();
+
   int OpenCall(int& number);
   int CloseCall(int number);
   int SetCallMode(int number, int mode);

@@ -28,6 +28,9 @@ class Reports {
   /// Waits for a callback that runs, which may need the loop's lock: it must not be held.
   void Unset(Host::Kind kind) { thread_.Unset(kind); }
 
+  /// Waits until the callbacks for what was reported have returned. The loop's lock must not be held.
+  void AwaitCallbacks() { thread_.WaitUntilReported(); }
+
  private:
   void Post(Host::Kind kind, int first, int second) noexcept;
 

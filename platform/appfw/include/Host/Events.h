@@ -4,9 +4,13 @@
 
 namespace Host {
 
-/// Returns when every event fired before, on any thread, has been delivered and its argument freed;
-/// at once when called from a listener.
+/// Returns when what the device has been told before has reached the program's callbacks, and every
+/// event fired before, on any thread, has been delivered and its argument freed. At once when called
+/// from a listener; from a device's callback it doesn't wait for what that one holds up.
 void WaitUntilDelivered();
+
+/// For a device: what `WaitUntilDelivered` calls first, to return when the callbacks have been called.
+void SetDeviceWait(void (*wait)());
 
 /// For a device that is about to fire an event, and only waits for what to say in it: keeps the
 /// dispatcher awake for a moment, so that delivery doesn't wait for it to wake up.

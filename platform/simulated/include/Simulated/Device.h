@@ -15,6 +15,8 @@
 
 namespace Simulated {
 
+using Host::WaitUntilDelivered;
+
 /// What a file holds. Any file that is opened holds the media that was set last; no real file is
 /// read.
 struct Media {
@@ -81,11 +83,6 @@ void SetCallSessionFault(CallSessionFault fault);
 
 /// \return the modes of the call sessions that are open, in the order of their creation.
 std::vector<int> GetCallSessionModes();
-
-/// Returns when everything reported before has been delivered: the device's callbacks have
-/// returned, and the events that they fired have reached their listeners. From inside a callback or
-/// a listener it doesn't wait for what that one holds up.
-void WaitUntilDelivered();
 
 /// @}
 

@@ -1,0 +1,158 @@
+// What only the simulated device can be made to do.
+
+#include "Listeners.h"
+#include "support/Allocations.h"
+
+#include <climits>
+#include <deque>
+#include <optional>
+#include <thread>
+
+namespace Zelkora::Media {
+namespace {
+
+using testing::ElementsAre;
+using testing::IsEmpty;
+
+using VolumeDevice = ManagerTest<Volume>;
+
+/// What the device may keep of its own, such as room in its queues.
+constexpr std::ptrdiff_t kKeptByTheDevice = 8;
+
+TEST_F(VolumeDevice, GuardedOperationsAllocateNothing) {
+  Host::RecordCalls(false);
+  int min = 0, max = 0;
+  const std::size_t before = CountAllocations();
+  EXPECT_EQ(manager.SetMediaVolumeLevel(7), E_SUCCESS);
+  EXPECT_EQ(manager.GetCurrentMediaVolumeLevel(), 7);
+  EXPECT_EQ(manager.GetMediaVolumeRange(min, max), E_SUCCESS);
+  EXPECT_EQ(manager.UnmuteAll(), E_SUCCESS);
+  EXPECT_EQ(manager.GetMuteStatus(), AUDIO_MUTE_STATUS_UNMUTED);
+  EXPECT_EQ(CountAllocations(), before);
+}
+
+TEST_F(VolumeDevice, UnknownSoundTypesAreLoggedAndFreed) {
+  Added<VolumeListener> listener;
+  Host::RecordCalls(false);  // the record would allocate
+  const std::ptrdiff_t before = CountLiveAllocations();
+  for (const int type : {6, -1, INT_MAX, INT_MIN}) {
+    for (int i = 0; i < kKeptByTheDevice; ++i) Simulated::ReportVolume(type, 3);
+    EXPECT_THAT(listener.Take(), IsEmpty());
+    const std::string line = SysPlain("sound type returned is wrong - " + std::to_string(type));
+    EXPECT_EQ(log.Take(), Lines(kKeptByTheDevice, line));
+  }
+  EXPECT_LT(CountLiveAllocations(), before + kKeptByTheDevice);
+}
+
+TEST_F(VolumeDevice, NotificationThatGoesWrongIsLostAlone) {
+  Added<VolumeListener> listener;
+  std::optional<FailingLibraryAllocation> failing;
+  const std::pair<std::function<void()>, std::string> rows[] = {
+      {[] { Simulated::ReportWithoutUserData(true); },
+       SysNamed(E_OBJ_NOT_FOUND, " _AudioVolumeManagerImpl is null.")},
+      {[] { Host::FailCall("_Event::FireAsync", E_OUT_OF_MEMORY); },
+       SysPlain("[E_OUT_OF_MEMORY]Failed to perform FireAsync operation.")},
+      {[&] { failing.emplace(); }, SysNamed(E_OUT_OF_MEMORY, " Memory allocation failed.")},
+  };
+  for (const auto& [arrange, line] : rows) {
+    SCOPED_TRACE(line);
+    Forget();
+    arrange();
+    Simulated::ReportVolume(4, 9);
+    Simulated::ReportMuteAll(true);
+    EXPECT_THAT(listener.Take(), IsEmpty());
+    ExpectLeft(kUntouched, {line, line}, {});
+    Simulated::Reset();
+    failing.reset();
+  }
+  Simulated::ReportVolume(4, 9);
+  EXPECT_THAT(listener.Take(), ElementsAre("Media 9"));
+}
+
+/// Counts calls; whether they come in order and one at a time shows in a plain integer.
+struct Counter : IAudioVolumeEventListener {
+  void OnMediaVolumeChanged(int level) override {
+    inOrder &= level == count;
+    ++count;
+  }
+
+  int count = 0;
+  bool inOrder = true;
+};
+
+TEST_F(VolumeDevice, ListenersComeAndGoWhileTwoSourcesReport) {
+  struct Restless : Counter {
+    void OnAlarmVolumeChanged(int level) override {
+      Volume& volume = *Volume::GetInstance();
+      EXPECT_EQ(volume.RemoveAudioVolumeEventListener(*this), E_SUCCESS);
+      EXPECT_EQ(volume.SetRingtoneVolumeLevel(level % 10), E_SUCCESS);
+      EXPECT_EQ(volume.AddAudioVolumeEventListener(*this), E_SUCCESS);
+    }
+  };
+  constexpr int kChanges = 2000;
+  Host::RecordCalls(false);
+  Added<Counter> steady;
+  Added<Restless> restless;
+  std::atomic<int> sources{2};
+  const auto report = [&](int type) {
+    for (int level = 0; level < kChanges; ++level) Simulated::ReportVolume(type, level);
+    --sources;
+  };
+  std::thread media(report, 4), alarm(report, 2);
+  const auto comeAndGo = [&] {
+    while (sources > 0) Added<VolumeListener> shortLived;
+  };
+  std::thread visitor(comeAndGo);
+  comeAndGo();
+  for (std::thread* thread : {&media, &alarm, &visitor}) thread->join();
+  Host::WaitUntilDelivered();
+  EXPECT_EQ(steady.count, kChanges);
+  EXPECT_TRUE(steady.inOrder);
+}
+
+TEST_F(VolumeDevice, ListenersThatHaveGoneLeaveNothingBehind) {
+  Host::RecordCalls(false);  // the record would grow
+  const std::ptrdiff_t live = CountLiveAllocations();
+  for (int i = 0; i < 100; ++i) Added<VolumeListener> passing;
+  EXPECT_LT(CountLiveAllocations(), live + kKeptByTheDevice);
+  VolumeListener listener;
+  FailingAllocation failing(1);
+  EXPECT_EQ(manager.AddAudioVolumeEventListener(listener), E_OUT_OF_MEMORY);
+}
+
+/// \return how many changes are reported to that many listeners: `ZELKORA_TEST_SCALE` per cent of a
+/// million. Unless the environment says it, 1 and 10 listeners get the whole million and 1,000 a
+/// tenth of it, which is 100 million calls; in emulation and under sanitizers, which take some fifty
+/// times as long, it is one per cent for all.
+int Changes(int listeners) {
+  const char* scale = std::getenv("ZELKORA_TEST_SCALE");
+  const int usual = listeners < 1000 ? ZELKORA_TEST_SCALE : (ZELKORA_TEST_SCALE + 9) / 10;
+  return std::max(10000 * (scale == nullptr ? usual : std::atoi(scale)), 2000);
+}
+
+class ManyChanges : public VolumeDevice, public testing::WithParamInterface<int> {};
+
+TEST_P(ManyChanges, AreAllDeliveredInOrderInTheMemoryOfAFew) {
+  constexpr int kBatch = 1000;
+  Host::RecordCalls(false);  // the record would grow
+  const int changes = Changes(GetParam());
+  std::deque<Added<Counter>> listeners(static_cast<std::size_t>(GetParam()));
+  std::ptrdiff_t live = 0;
+  for (int level = 0; level < changes; ++level) {
+    Simulated::ReportVolume(4, level);
+    if ((level + 1) % kBatch != 0) continue;
+    Host::WaitUntilDelivered();
+    if (level + 1 == kBatch) live = CountLiveAllocations();
+    ASSERT_LT(CountLiveAllocations(), live + kKeptByTheDevice);
+  }
+  for (const Counter& listener : listeners) {
+    ASSERT_EQ(listener.count, changes);
+    ASSERT_TRUE(listener.inOrder);
+  }
+}
+
+INSTANTIATE_TEST_SUITE_P(ToListeners, ManyChanges, testing::Values(1, 10, 1000),
+                         testing::PrintToStringParamName());
+
+}  // namespace
+}  // namespace Zelkora::Media

@@ -85,9 +85,9 @@ int Device::Await(Lock& lock, Time limit, const Batch& batch) {
 int Device::SetLevel(Category category, int level) {
   Lock lock(loop_.GetMutex());
   const Time limit = GetLimit();
-  // What is stored is written as a whole, so what others have changed in it must be known.
+  // What is stored is written as a whole, so what others have changed must be known.
   if (const int error = ReadEvents(lock, limit)) return error;
-  if (const int error = AwaitAnswers(lock, limit, volumesQuestion_)) return error;
+  if (const int error = AwaitAnswers(lock, limit, questions_.GetNews())) return error;
   if (!volumes_.AreStored()) return SOUND_MANAGER_ERROR_INVALID_OPERATION;
   Batch batch(loop_, [=] { volumes_.OnDone(category, level); });
   volumes_.Send(connection_.GetContext(), category, level, !isPipeWire_, batch);

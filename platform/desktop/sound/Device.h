@@ -124,7 +124,6 @@ class Device final : private Connection::Owner, private CallSession::Owner {
   Streams streams_;
   Volumes volumes_{reports_, streams_};
   bool areVolumesDue_ = false;
-  std::uint64_t volumesQuestion_ = 0;  // the last one's number
   Timer volumesTimer_{loop_, [this] { AskForVolumes(); }};
   int ownWrites_ = 0;  // of stored volumes, whose events haven't come yet
   Output output_{reports_, streams_};

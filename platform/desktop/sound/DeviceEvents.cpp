@@ -71,7 +71,7 @@ void Device::AskForVolumes() {
   // PipeWire acknowledges a write before it can be read, and so would seem to take it back.
   if (isPipeWire_ && isComplete_) return;
   questions_.Ask(pa_ext_stream_restore_read(connection_.GetContext(), OnVolume, this));
-  volumesQuestion_ = questions_.GetAsked();
+  questions_.ExpectNews();
 }
 
 /// While streams are being asked, their answers are likely to tell the same. The question makes work
@@ -128,6 +128,7 @@ void Device::OnStreamEvent(int type, std::uint32_t index) {
   AskForStream(index);
   Stream* stream = streams_.Find(index);
   if (stream != nullptr && std::exchange(stream->isEchoDue, false)) return;
+  questions_.ExpectNews();
   // Not at once, because waking threads up takes time: the server has its question first.
   loop_.CallWhenIdle([this] { reports_.ExpectLevel(); });
 }

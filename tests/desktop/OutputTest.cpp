@@ -1,0 +1,62 @@
+// Null sinks have no ports, so what the server would tell of headphones is made up here.
+
+#include "desktop/sound/Output.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+namespace Desktop {
+namespace {
+
+constexpr int kNo = PA_PORT_AVAILABLE_NO;
+constexpr int kYes = PA_PORT_AVAILABLE_YES;
+constexpr int kUnknown = PA_PORT_AVAILABLE_UNKNOWN;
+
+/// Tells of a sink with headphones and a speaker.
+void Tell(Output& output, int headphones, bool isSpeakerActive) {
+  pa_sink_port_info ports[2] = {};
+  ports[0].name = "headphones";
+  ports[0].available = headphones;
+  ports[1].name = "speaker";
+  pa_sink_port_info* list[] = {&ports[0], &ports[1], nullptr};
+  pa_sink_info sink = {};
+  sink.index = 7;
+  sink.state = PA_SINK_RUNNING;
+  sink.n_ports = 2;
+  sink.ports = list;
+  sink.active_port = list[isSpeakerActive ? 1 : 0];
+  output.OnTold(sink);
+}
+
+TEST(Headphones, DisruptWhenTheyAreUnpluggedAndOnlyThen) {
+  const struct {
+    const char* name;
+    int before, after;
+    bool goesToSpeaker;
+    bool disrupts;
+  } rows[] = {
+      {"unplugged", kYes, kNo, false, true},
+      {"unplugged, which the server has acted on already", kYes, kNo, true, true},
+      {"unplugged, of which nothing was known before", kUnknown, kNo, true, true},
+      {"plugged in", kNo, kYes, false, false},
+      {"not used though plugged in", kYes, kYes, true, false},
+      {"left for the speaker, having been unplugged before", kNo, kNo, true, false},
+      {"not watched", kUnknown, kUnknown, false, false},
+  };
+  static auto& reports = *new Reports;  // isn't made to be destroyed
+  for (const auto& row : rows) {
+    std::vector<int> codes;
+    const Streams streams;
+    Output output(reports, streams);
+    reports.Set(Host::Kind::kInterruption,
+                [&](const Host::Report& report) { codes.push_back(report.first); });
+    Tell(output, row.before, false);
+    for (int i = 0; i < 2; ++i) Tell(output, row.after, row.goesToSpeaker);
+    reports.AwaitCallbacks();
+    EXPECT_EQ(codes, row.disrupts ? std::vector<int>{3} : std::vector<int>{}) << row.name;
+    reports.Unset(Host::Kind::kInterruption);
+  }
+}
+
+}  // namespace
+}  // namespace Desktop

@@ -161,9 +161,10 @@ void Device::OnOutput(pa_context*, const pa_sink_info* info, int end, void* self
   device.OnAnswered();
 }
 
-void Device::OnStream(pa_context*, const pa_sink_input_info* info, int, void* self) {
+void Device::OnStream(pa_context*, const pa_sink_input_info* info, int end, void* self) {
   Device& device = ToDevice(self);
   if (info != nullptr) return device.PutStream(*info);
+  if (end < 0) device.streams_.OnUnanswered();
   device.OnAnswered();
 }
 

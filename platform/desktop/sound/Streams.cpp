@@ -53,6 +53,10 @@ Stream* Streams::Find(std::uint32_t index) {
   return found == streams_.end() ? nullptr : &found->second;
 }
 
+void Streams::OnUnanswered() {
+  for (auto& [index, stream] : streams_) stream.isBeingRead = false;  // whichever it was about
+}
+
 bool Streams::IsAnyMuted(Category category) const {
   return HasStream(streams_, [=](const Stream& stream) {
     return stream.category == category && stream.isMuted;

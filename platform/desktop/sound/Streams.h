@@ -46,6 +46,9 @@ class Streams {
   void Remove(std::uint32_t index) { streams_.erase(index); }
   void Clear() { streams_.clear(); }
 
+  /// A question about a stream wasn't answered.
+  void OnUnanswered();
+
   Map& All() { return streams_; }
 
   bool IsAnyMuted(Category category) const;

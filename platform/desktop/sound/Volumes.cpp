@@ -131,8 +131,8 @@ void Volumes::OnDone(Category category, int level) {
   }
   for (auto& [index, stream] : streams_.All()) {
     if (stream.category == category && stream.canChangeVolume) {
-      stream.volume = Scale(stream.volume, level);
-      stream.isEchoDue = true;
+      const pa_cvolume before = std::exchange(stream.volume, Scale(stream.volume, level));
+      stream.isEchoDue = !pa_cvolume_equal(&stream.volume, &before);
     }
   }
   Change(category, level);

@@ -1,10 +1,10 @@
 // What the library relies on in the sound manager, shown by the simulated device, and its steering.
 
 #include "support/Gate.h"
+#include "support/NativeListener.h"
 #include "support/OwnProcess.h"
 
 #include <Simulated/Device.h>
-#include <sound_manager.h>
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -18,41 +18,6 @@
 namespace {
 
 using testing::ElementsAre;
-
-/// What the three callbacks are told while it lives.
-class Program {
- public:
-  explicit Program(std::function<void()> onReport = [] {}) : onReport_(std::move(onReport)) {
-    sound_manager_set_volume_changed_cb(
-        [](int type, int level, void* program) {
-          Hear(program, std::to_string(type) + "=" + std::to_string(level));
-        },
-        this);
-    sound_manager_set_muteall_changed_cb(
-        [](bool muteall, void* program) { Hear(program, muteall ? "muted" : "unmuted"); }, this);
-    sound_manager_set_session_interrupted_cb(
-        [](int code, void* program) { Hear(program, "code " + std::to_string(code)); }, this);
-  }
-
-  ~Program() {
-    sound_manager_unset_volume_changed_cb();
-    sound_manager_unset_muteall_changed_cb();
-    sound_manager_unset_session_interrupted_cb();
-  }
-
-  std::vector<std::string> heard;
-  std::vector<std::thread::id> threads;
-
- private:
-  static void Hear(void* program, std::string report) {
-    auto& self = *static_cast<Program*>(program);
-    self.heard.push_back(std::move(report));
-    self.threads.push_back(std::this_thread::get_id());
-    self.onReport_();
-  }
-
-  const std::function<void()> onReport_;
-};
 
 class SoundManagerTest : public testing::Test {
  protected:
@@ -70,7 +35,9 @@ int LevelOf(int type) {
 }
 
 TEST_F(Reports, TellEveryChangeOnceInOrderOnOneThreadOfTheDevicesOwn) {
-  Program program;
+  std::vector<std::thread::id> threads;
+  NativeListener listener(NativeListener::kAll,
+                          [&] { threads.push_back(std::this_thread::get_id()); });
   sound_manager_set_volume(4, 9);
   sound_manager_set_volume(4, 9);
   sound_manager_set_volume(0, LevelOf(0));
@@ -84,17 +51,16 @@ TEST_F(Reports, TellEveryChangeOnceInOrderOnOneThreadOfTheDevicesOwn) {
   EXPECT_TRUE(Simulated::SetMaxVolume(4, 8));
   EXPECT_TRUE(Simulated::SetMaxVolume(5, 30));
   EXPECT_EQ(sound_manager_set_volume(5, 30), 0);
-  Host::WaitUntilDelivered();
-  EXPECT_THAT(program.heard,
+  EXPECT_THAT(listener.TakeAll(),
               ElementsAre("4=9", "muted", "5=2", "6=1", "unmuted", "code -7", "4=8", "5=30"));
-  EXPECT_THAT(program.threads, testing::Each(program.threads[0]));
-  EXPECT_NE(program.threads[0], std::this_thread::get_id());
+  EXPECT_THAT(threads, testing::Each(threads[0]));
+  EXPECT_NE(threads[0], std::this_thread::get_id());
 }
 
 TEST_F(UnsettingACallback, WaitsForItsCallAndDropsWhatIsOnTheWayForItAlone) {
   Gate gate;
   bool finished = false;
-  Program program([&] {
+  NativeListener listener(NativeListener::kAll, [&] {
     if (finished) return;
     gate.Pass();
     for (int i = 0; i < 1000; ++i) std::this_thread::yield();  // time for who doesn't wait
@@ -112,13 +78,12 @@ TEST_F(UnsettingACallback, WaitsForItsCallAndDropsWhatIsOnTheWayForItAlone) {
   EXPECT_EQ(sound_manager_unset_volume_changed_cb(), 0);
   Simulated::Interrupt(1);
   Simulated::ReportVolume(4, 3);
-  Host::WaitUntilDelivered();
-  EXPECT_THAT(program.heard, ElementsAre("4=1", "muted"));
+  EXPECT_THAT(listener.TakeAll(), ElementsAre("4=1", "muted"));
 }
 
 TEST_F(UnsettingACallback, InsideItDoesNotWaitAndNothingMoreComes) {
   Gate gate;
-  Program program([&] {
+  NativeListener listener(NativeListener::kAll, [&] {
     gate.Pass();
     Host::WaitUntilDelivered();  // not for this call
     sound_manager_unset_volume_changed_cb();
@@ -126,8 +91,7 @@ TEST_F(UnsettingACallback, InsideItDoesNotWaitAndNothingMoreComes) {
   Simulated::ReportVolume(4, 1);
   Simulated::ReportVolume(4, 2);
   gate.Open();
-  Host::WaitUntilDelivered();
-  EXPECT_THAT(program.heard, ElementsAre("4=1"));
+  EXPECT_THAT(listener.TakeAll(), ElementsAre("4=1"));
 }
 
 TEST_F(UnsettingACallback, WhileReportsPourInEndsItsCalls) {
@@ -135,7 +99,7 @@ TEST_F(UnsettingACallback, WhileReportsPourInEndsItsCalls) {
   std::thread source([&] {
     while (!over) Simulated::ReportVolume(4, 1);
   });
-  for (int i = 0; i < 300; ++i) Program program;
+  for (int i = 0; i < 300; ++i) NativeListener listener(NativeListener::kAll);
   over = true;
   source.join();
 }

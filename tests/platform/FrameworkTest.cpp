@@ -20,27 +20,19 @@ std::string Logged(void (*log)()) {
   return testing::internal::GetCapturedStderr();
 }
 
-TEST(LastResult, IsEachThreadsOwnAndRecordedByTheFailuresOfThePlatformFamilyOnly) {
+TEST(LogLine, TellsAllThereIsAndThePlatformFamilysFailureAloneIsTheThreadsLastResult) {
   SetLastResult(E_SYSTEM);
   std::thread([] { EXPECT_EQ(GetLastResult(), E_SUCCESS); }).join();
-  Logged([] { SysLogInternal(80, "", 1, "b"); });
-  Logged([] { AppLogExceptionTagInternal("T", "f", 1, "c"); });
-  EXPECT_EQ(GetLastResult(), E_SYSTEM);
-  Logged([] { SysLogExceptionInternal(80, E_INVALID_ARG, "", 1, "d"); });
-  EXPECT_EQ(GetLastResult(), E_INVALID_ARG);
-  Logged([] { SysTryReturnResultInternal(80, E_INVALID_STATE, "", 1, "a"); });
-  EXPECT_EQ(GetLastResult(), E_INVALID_STATE);
-}
-
-TEST(LogLine, TellsLevelFamilyResultFunctionLineAndMessageUnlessThatIsTooLong) {
-  EXPECT_EQ(Logged([] { SysLogExceptionInternal(80, E_SYSTEM, "", 7, "[%s] %d", "x", 5); }),
-            "zelkora error module=80 result=E_SYSTEM line=7: [x] 5\n");
-  EXPECT_EQ(Logged([] { SysLogExceptionInternal(80, 0xA0ABCDEF, "", 7, "x"); }),
-            "zelkora error module=80 result=result 0xA0ABCDEF line=7: x\n");
-  EXPECT_EQ(Logged([] { AppLogExceptionTagInternal("TAG", "int f(int)", 9, "m"); }),
-            "zelkora error tag=TAG function=\"int f(int)\" line=9: m\n");
   EXPECT_EQ(Logged([] { SysLogInternal(80, "", 1, "%s", std::string(100000, 'x').c_str()); }),
             "zelkora info module=80 line=1: " + std::string(1023, 'x') + "\n");
+  EXPECT_EQ(Logged([] { AppLogExceptionTagInternal("TAG", "int f(int)", 9, "m"); }),
+            "zelkora error tag=TAG function=\"int f(int)\" line=9: m\n");
+  EXPECT_EQ(GetLastResult(), E_SYSTEM);
+  EXPECT_EQ(Logged([] { SysLogExceptionInternal(80, 0xA0ABCDEF, "", 7, "[%s] %d", "x", 5); }),
+            "zelkora error module=80 result=result 0xA0ABCDEF line=7: [x] 5\n");
+  EXPECT_EQ(GetLastResult(), 0xA0ABCDEF);
+  Logged([] { SysTryReturnResultInternal(80, E_INVALID_STATE, "", 1, "a"); });
+  EXPECT_EQ(GetLastResult(), E_INVALID_STATE);
 }
 
 TEST(LogSink, TakesTheLinesUntilItIsRemovedAndMayLogItself) {
@@ -53,36 +45,27 @@ TEST(LogSink, TakesTheLinesUntilItIsRemovedAndMayLogItself) {
   EXPECT_EQ(Logged([] { SysLogInternal(80, "", 1, "b"); }), "zelkora info module=80 line=1: b\n");
 }
 
-result Lookup(const wchar_t* key, bool& value) {
-  return Tizen::System::SystemInfo::GetValue(Tizen::Base::String(key), value);
-}
-
-TEST(Features, OfAnyHostAreFoundAndUnknownKeysLeaveTheValue) {
+TEST(Features, OfAnyHostAreFoundAndUnknownOrFailingOnesLeaveTheValue) {
   bool value = false;
-  EXPECT_EQ(Lookup(L"http://any.host/tizen/feature/audio_manager", value), E_SUCCESS);
-  EXPECT_TRUE(value);
-  for (const wchar_t* key :
-       {L"", L"http://", L"http://host", L"http://host/tizen/feature/",
-        L"http://host/tizen/feature/audio_managers", L"http://host/tizen/feature/audio_manage",
-        L"http://host/tizen/privilege/audio_manager", L"/tizen/feature/audio_manager"}) {
-    EXPECT_EQ(Lookup(key, value), E_OBJ_NOT_FOUND);
-    EXPECT_TRUE(value);
-  }
-}
-
-TEST(FailingCalls, HitTheCallsAskedForAndNoOthers) {
-  const auto expect = [](const std::vector<result>& expected) {
-    bool value = false;
-    for (const result r : expected)
-      EXPECT_EQ(Lookup(L"http://h/tizen/feature/audio_manager", value), r);
+  const auto lookup = [&](const wchar_t* key) {
+    return Tizen::System::SystemInfo::GetValue(Tizen::Base::String(key), value);
   };
+  constexpr wchar_t kKnown[] = L"http://any.host/tizen/feature/audio_manager";
   Host::FailCall("SystemInfo::GetValue", E_SYSTEM, 2);
   Host::FailCall("another", E_INVALID_ARG);
-  expect({E_SUCCESS, E_SYSTEM, E_SUCCESS});
+  EXPECT_EQ(lookup(kKnown), E_SUCCESS);
+  for (const result expected : {E_SYSTEM, E_SUCCESS}) EXPECT_EQ(lookup(kKnown), expected);
+  EXPECT_TRUE(value);
+  for (const wchar_t* key :
+       {L"", L"http://", L"http://host", L"http://host/tizen/feature/audio_managers",
+        L"http://host/tizen/feature/audio_manage", L"http://host/tizen/privilege/audio_manager"}) {
+    EXPECT_EQ(lookup(key), E_OBJ_NOT_FOUND);
+    EXPECT_TRUE(value);
+  }
   Host::FailCall("SystemInfo::GetValue", E_INVALID_STATE);
-  expect({E_INVALID_STATE, E_INVALID_STATE});
+  for (int n = 0; n < 2; ++n) EXPECT_EQ(lookup(kKnown), E_INVALID_STATE);
   Host::ClearFailures();
-  expect({E_SUCCESS});
+  EXPECT_EQ(lookup(kKnown), E_SUCCESS);
 }
 
 }  // namespace

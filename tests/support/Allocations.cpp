@@ -24,35 +24,22 @@ void* Allocate(std::size_t size) {
   return std::malloc(size);
 }
 
-void* AllocateOrNull(std::size_t size) {
-  return librarySpared.fetch_sub(1) > 0 ? Allocate(size) : nullptr;
-}
+}  // namespace
 
-void Free(void* memory) {
-  if (memory != nullptr) live.fetch_sub(1, std::memory_order_relaxed);
-  std::free(memory);
-}
-
-void* AllocateOrThrow(std::size_t size) {
+// Arrays are left alone: nobody makes them.
+void* operator new(std::size_t size) {
   void* memory = Allocate(size);
   if (memory == nullptr) throw std::bad_alloc();
   return memory;
 }
-
-}  // namespace
-
-void* operator new(std::size_t size) { return AllocateOrThrow(size); }
-void* operator new[](std::size_t size) { return AllocateOrThrow(size); }
 void* operator new(std::size_t size, const std::nothrow_t&) noexcept {
-  return AllocateOrNull(size);
+  return librarySpared.fetch_sub(1) > 0 ? Allocate(size) : nullptr;
 }
-void* operator new[](std::size_t size, const std::nothrow_t&) noexcept {
-  return AllocateOrNull(size);
+void operator delete(void* memory) noexcept {
+  if (memory != nullptr) live.fetch_sub(1, std::memory_order_relaxed);
+  std::free(memory);
 }
-void operator delete(void* memory) noexcept { Free(memory); }
-void operator delete[](void* memory) noexcept { Free(memory); }
-void operator delete(void* memory, std::size_t) noexcept { Free(memory); }
-void operator delete[](void* memory, std::size_t) noexcept { Free(memory); }
+void operator delete(void* memory, std::size_t) noexcept { operator delete(memory); }
 
 std::size_t CountAllocations() { return count; }
 

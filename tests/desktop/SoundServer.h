@@ -38,8 +38,7 @@ class Program {
   void Wait();
 
   pid_t process_ = -1;
-  int input_ = -1;
-  int output_ = -1;
+  int socket_ = -1;  // the program's input and output
   int status_ = 0;
 };
 

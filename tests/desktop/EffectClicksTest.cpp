@@ -40,18 +40,14 @@ class Tone {
       const double value = kAmplitude * std::sin(2 * M_PI * kFrequency * sent_++ / kRate);
       sent.insert(sent.end(), 2, static_cast<float>(value));
     }
-    const BufferPtr heard(gst_harness_push_and_pull(
-        harness_.get(), gst_buffer_new_memdup(sent.data(), sent.size() * sizeof(float))));
-    ASSERT_NE(heard, nullptr);
-    std::vector<float> received(sent.size());
-    ASSERT_EQ(gst_buffer_extract(heard.get(), 0, received.data(), sent.size() * sizeof(float)),
-              sent.size() * sizeof(float));
-    for (std::size_t i = 0; i < received.size(); i += 2) samples->push_back(received[i]);
+    const gsize size = sent.size() * sizeof(float);
+    const std::unique_ptr<GstBuffer, FreeWith<gst_buffer_unref>> heard(
+        gst_harness_push_and_pull(harness_.get(), gst_buffer_new_memdup(sent.data(), size)));
+    ASSERT_EQ(gst_buffer_extract(heard.get(), 0, sent.data(), size), size);
+    for (std::size_t i = 0; i < sent.size(); i += 2) samples->push_back(sent[i]);
   }
 
  private:
-  using BufferPtr = std::unique_ptr<GstBuffer, FreeWith<gst_buffer_unref>>;
-
   EffectChain chain_;
   std::unique_ptr<GstHarness, FreeWith<gst_harness_teardown>> harness_;
   int sent_ = 0;
@@ -79,10 +75,8 @@ void ChangeSomething(SharedSettings* settings, std::mt19937* random) {
   settings->SetLevel(what, std::array{range.min, range.max, kDefaultLevel}[(*random)() % 3]);
 }
 
-class EffectClicks : public testing::TestWithParam<int> {
- protected:
-  static void SetUpTestSuite() { gst_init(nullptr, nullptr); }
-};
+/// Of buffers of so many frames.
+class EffectClicks : public testing::TestWithParam<int> {};
 
 TEST_P(EffectClicks, ThousandChangesStayFarBelowTheSound) {
   SharedSettings settings;
@@ -116,6 +110,7 @@ INSTANTIATE_TEST_SUITE_P(BuffersOf, EffectClicks, testing::Values(256, 1024, 409
 
 int main(int count, char** arguments) {
   testing::InitGoogleTest(&count, arguments);
+  gst_init(nullptr, nullptr);
   const int failed = RUN_ALL_TESTS();
   // Then GStreamer tells what was leaked, if it was asked to look.
   gst_deinit();

@@ -2,9 +2,13 @@
 
 #include "sound/Session.h"
 
+#include <gst/base/gstbasesink.h>
 #include <pulse/pulseaudio.h>
 
+#include <algorithm>
 #include <chrono>
+#include <cstring>
+#include <thread>
 
 namespace Desktop {
 namespace {
@@ -13,6 +17,9 @@ using Clock = std::chrono::steady_clock;
 
 /// A local server answers in some milliseconds.
 constexpr std::chrono::milliseconds kServerLimit{300};
+
+/// As far as a sink writes ahead of what is heard, and so the longest wait for it.
+constexpr std::chrono::milliseconds kWrittenAhead{200};
 
 using MainLoopPtr = std::unique_ptr<pa_mainloop, FreeWith<pa_mainloop_free>>;
 using ContextPtr = std::unique_ptr<pa_context, FreeWith<pa_context_unref>>;
@@ -42,22 +49,72 @@ bool IsSoundServerThere() {
   return isThere;
 }
 
-/// Tells the server what the stream is: the session's role, and that it is a player's.
-void SetStreamProperties(GstElement* sink) {
-  const std::unique_ptr<GstStructure, FreeWith<gst_structure_free>> properties(
-      gst_structure_new("properties", "media.role", G_TYPE_STRING, GetPlayerRole(), kPlayerProperty,
-                        G_TYPE_STRING, "1", nullptr));
+constexpr char kRoleProperty[] = "media.role";
+
+using StructurePtr = std::unique_ptr<GstStructure, FreeWith<gst_structure_free>>;
+
+/// Tells the server what the sink's next stream is: its role, and that it is a player's.
+void SetStreamProperties(GstElement* sink, const char* role) {
+  const StructurePtr properties(gst_structure_new("properties", kRoleProperty, G_TYPE_STRING, role,
+                                                  kPlayerProperty, G_TYPE_STRING, "1", nullptr));
   g_object_set(sink, "stream-properties", properties.get(), nullptr);
+}
+
+bool HasRole(GstElement* sink, const char* role) {
+  GstStructure* got = nullptr;
+  g_object_get(sink, "stream-properties", &got, nullptr);
+  const StructurePtr properties(got);
+  return std::strcmp(gst_structure_get_string(properties.get(), kRoleProperty), role) == 0;
+}
+
+/// Waits until what was written before \p next has been heard: a stream that ends drops it.
+void AwaitEnd(GstElement* sink, GstBuffer* next) {
+  const GstClockTime begin = gst_segment_to_running_time(&GST_BASE_SINK(sink)->segment,
+                                                         GST_FORMAT_TIME, GST_BUFFER_PTS(next));
+  const GstClockTime now = gst_element_get_current_running_time(sink);
+  if (!GST_CLOCK_TIME_IS_VALID(begin) || !GST_CLOCK_TIME_IS_VALID(now) || begin < now) return;
+  const std::chrono::nanoseconds ahead(begin - now);
+  std::this_thread::sleep_for(std::min<std::chrono::nanoseconds>(ahead, kWrittenAhead));
+}
+
+/// A sink makes a new stream when the caps of its sound change. A field that nobody reads makes
+/// them differ.
+void ReplaceStream(GstPad* pad, const char* role) {
+  const CapsPtr sound(gst_pad_get_current_caps(pad));
+  if (sound == nullptr) return;
+  const CapsPtr marked(gst_caps_copy(sound.get()));
+  gst_caps_set_simple(marked.get(), kRoleProperty, G_TYPE_STRING, role, nullptr);
+  gst_pad_send_event(pad, gst_event_new_caps(marked.get()));
+}
+
+/// Has the stream follow the session's role. On the streaming thread, which alone uses the sink's
+/// properties by then.
+GstPadProbeReturn OnSound(GstPad* pad, GstPadProbeInfo* info, gpointer data) {
+  GstElement* sink = GST_ELEMENT(data);
+  const char* role = GetPlayerRole();
+  if (!HasRole(sink, role)) {
+    AwaitEnd(sink, GST_PAD_PROBE_INFO_BUFFER(info));
+    SetStreamProperties(sink, role);
+    NoteStreamReplaced();
+    ReplaceStream(pad, role);
+  }
+  return GST_PAD_PROBE_OK;
+}
+
+ElementPtr MakePulseSink() {
+  ElementPtr sink = MakeElement("pulsesink");
+  if (sink == nullptr) return nullptr;
+  SetStreamProperties(sink.get(), GetPlayerRole());
+  const PadPtr pad(gst_element_get_static_pad(sink.get(), "sink"));
+  gst_pad_add_probe(pad.get(), GST_PAD_PROBE_TYPE_BUFFER, OnSound, sink.get(), nullptr);
+  return sink;
 }
 
 }  // namespace
 
 ElementPtr MakeAudioSink() {
   if (IsSoundServerThere()) {
-    if (ElementPtr sink = MakeElement("pulsesink")) {
-      SetStreamProperties(sink.get());
-      return sink;
-    }
+    if (ElementPtr sink = MakePulseSink()) return sink;
   }
   ElementPtr sink = MakeElement("fakesink");
   if (sink != nullptr) g_object_set(sink.get(), "sync", TRUE, nullptr);

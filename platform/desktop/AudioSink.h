@@ -6,7 +6,8 @@
 namespace Desktop {
 
 /// \return where a player's sound goes: to the sound server, or, when none answers at once,
-/// nowhere, in real time. Null when not even that can be made.
+/// nowhere, in real time. Null when not even that can be made. The stream on the server follows the
+/// session's role; when the server is lost, the sink fails.
 ElementPtr MakeAudioSink();
 
 }  // namespace Desktop

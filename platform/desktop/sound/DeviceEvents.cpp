@@ -3,6 +3,7 @@
 
 #include "Device.h"
 #include "Log.h"
+#include "Session.h"
 
 #include <cstring>
 #include <utility>
@@ -134,9 +135,11 @@ void Device::OnStreamEvent(int type, std::uint32_t index) {
 }
 
 void Device::OnStreamRemoved(std::uint32_t index) {
-  // A player corks its stream before it closes it.
+  // A player corks its stream before it closes it, but a server that has both to tell at once leaves
+  // the corking out.
   const Stream* stream = streams_.Find(index);
-  if (stream != nullptr && stream->isPlayer && stream->IsHeard() && !stream->isBeingRead) {
+  if (stream != nullptr && stream->isPlayer && stream->IsHeard() && !stream->isBeingRead &&
+      !WasStreamJustReplaced()) {
     reports_.ReportInterruption(kTakenOver);
   }
   streams_.Remove(index);

@@ -5,6 +5,7 @@
 #include <Host/Calls.h>
 #include <sound_manager.h>
 
+#include <chrono>
 #include <mutex>
 #include <new>
 
@@ -22,11 +23,17 @@ constexpr int kTypes = 4;
 constexpr int kMix = 1;
 constexpr char kMixRole[] = "game";
 
+using Clock = std::chrono::steady_clock;
+
+/// Longer than the server takes to tell that a stream has ended.
+constexpr std::chrono::seconds kReplacement{1};
+
 struct Session {
   std::mutex mutex;
   int type = kMediaType;
   int first = 0;
   int second = 0;
+  Clock::time_point replaced;  // a player's stream
 
   const char* GetRole() const {
     return type == kMediaType && first == kMix ? kMixRole : kRoleOfType[type];
@@ -46,6 +53,18 @@ const char* GetPlayerRole() {
   Session& session = Session::Get();
   std::lock_guard lock(session.mutex);
   return session.GetRole();
+}
+
+void NoteStreamReplaced() {
+  Session& session = Session::Get();
+  std::lock_guard lock(session.mutex);
+  session.replaced = Clock::now();
+}
+
+bool WasStreamJustReplaced() {
+  Session& session = Session::Get();
+  std::lock_guard lock(session.mutex);
+  return Clock::now() - session.replaced < kReplacement;
 }
 
 }  // namespace Desktop

@@ -8,8 +8,14 @@ namespace Desktop {
 /// player's stream that was taken away from one that its owner closed.
 inline constexpr char kPlayerProperty[] = "zelkora.player";
 
-/// \return the media role of the player streams that this process makes from now on, valid for ever: "music" or
-/// "game" (plays along with others' media), "alarm", "notification"
+/// For any thread. \return the media role of this process's player streams as the session is now,
+/// valid for ever: "music" or "game" (plays along with others' media), "alarm", "notification"
 const char* GetPlayerRole();
+
+/// To be called when a player replaces its stream, which is then not taken away by anybody.
+void NoteStreamReplaced();
+
+/// \return whether a player of this process has replaced its stream in the last second
+bool WasStreamJustReplaced();
 
 }  // namespace Desktop

@@ -5,6 +5,7 @@
 #include "support/NativeListener.h"
 
 #include <Tizen/Media/Player.h>
+#include <Tizen/Media/PlayerImpl.h>
 #include <Zelkora/Media/AudioSessionManager.h>
 #include <Zelkora/Media/AudioVolumeManager.h>
 #include <Zelkora/Media/IAudioSessionEventListener.h>
@@ -305,6 +306,25 @@ TEST(SoundServerFaults, CallbacksReportAgainByThemselvesWhenTheServerIsBack) {
   EXPECT_EQ(listener.Take(), Level(kMedia, kMax));
   const Player secondCall({Role("phone")});
   EXPECT_EQ(listener.Take(), "code 5");
+}
+
+TEST(SoundServerFaults, PlayerFailsWithTheServerUntilItsFileIsOpenedAgain) {
+  SoundServer server;
+  server.Start();
+  Tizen::Media::Player player;
+  ASSERT_EQ(player.Construct(), E_SUCCESS);
+  ASSERT_EQ(player.OpenFile(Film().c_str()), E_SUCCESS);
+  ASSERT_EQ(player.Play(), E_SUCCESS);
+  server.Kill();
+  EXPECT_TRUE(ComesTrue([&] { return player.GetPosition() < 0; }));
+  ExpectSoon(E_SYSTEM, [&] { return player.Play(); });
+  ExpectSoon(E_SYSTEM, [&] { return player.Pause(); });
+  ExpectSoon(E_SYSTEM,
+             [&] { return Tizen::Media::_PlayerImpl::GetInstance(&player)->SeekTo(0, false); });
+  server.Start();
+  ASSERT_EQ(player.OpenFile(Film().c_str()), E_SUCCESS);
+  EXPECT_EQ(player.Play(), E_SUCCESS);
+  EXPECT_EQ(ListStreams(RoleLine("music")).size(), 1u);
 }
 
 TEST(SoundServerFaults, OpenCallIsOpenedAgainByItself) {

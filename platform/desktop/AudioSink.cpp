@@ -51,6 +51,9 @@ bool IsSoundServerThere() {
 
 constexpr char kRoleProperty[] = "media.role";
 
+/// The sink's own mark while it has no stream.
+constexpr char kReplacing[] = "zelkora-replacing";
+
 using StructurePtr = std::unique_ptr<GstStructure, FreeWith<gst_structure_free>>;
 
 /// Tells the server what the sink's next stream is: its role, and that it is a player's.
@@ -96,7 +99,9 @@ GstPadProbeReturn OnSound(GstPad* pad, GstPadProbeInfo* info, gpointer data) {
     AwaitEnd(sink, GST_PAD_PROBE_INFO_BUFFER(info));
     SetStreamProperties(sink, role);
     NoteStreamReplaced();
+    g_object_set_data(G_OBJECT(sink), kReplacing, sink);
     ReplaceStream(pad, role);
+    g_object_set_data(G_OBJECT(sink), kReplacing, nullptr);
   }
   return GST_PAD_PROBE_OK;
 }
@@ -111,6 +116,10 @@ ElementPtr MakePulseSink() {
 }
 
 }  // namespace
+
+bool IsReplacingStream(GstObject* object) {
+  return g_object_get_data(G_OBJECT(object), kReplacing) != nullptr;
+}
 
 ElementPtr MakeAudioSink() {
   if (IsSoundServerThere()) {

@@ -1,5 +1,7 @@
 #include "PipelineWatch.h"
 
+#include "AudioSink.h"
+
 #include <gst/pbutils/pbutils.h>
 
 #include <new>
@@ -62,6 +64,7 @@ void PipelineWatch::Read(GstMessage* message) {
 }
 
 void PipelineWatch::ReadError(GstMessage* message) {
+  if (IsReplacingStream(GST_MESSAGE_SRC(message))) return;
   GError* parsed = nullptr;
   gst_message_parse_error(message, &parsed, nullptr);
   const ErrorPtr error(parsed);

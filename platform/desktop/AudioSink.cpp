@@ -82,12 +82,12 @@ void AwaitEnd(GstElement* sink, GstBuffer* next) {
 
 /// A sink makes a new stream when the caps of its sound change. A field that nobody reads makes
 /// them differ.
-void ReplaceStream(GstPad* pad, const char* role) {
+bool ReplaceStream(GstPad* pad, const char* role) {
   const CapsPtr sound(gst_pad_get_current_caps(pad));
-  if (sound == nullptr) return;
+  if (sound == nullptr) return true;
   const CapsPtr marked(gst_caps_copy(sound.get()));
   gst_caps_set_simple(marked.get(), kRoleProperty, G_TYPE_STRING, role, nullptr);
-  gst_pad_send_event(pad, gst_event_new_caps(marked.get()));
+  return gst_pad_send_event(pad, gst_event_new_caps(marked.get()));
 }
 
 /// Has the stream follow the session's role. On the streaming thread, which alone uses the sink's
@@ -100,8 +100,12 @@ GstPadProbeReturn OnSound(GstPad* pad, GstPadProbeInfo* info, gpointer data) {
     SetStreamProperties(sink, role);
     NoteStreamReplaced();
     g_object_set_data(G_OBJECT(sink), kReplacing, sink);
-    ReplaceStream(pad, role);
+    const bool isReplaced = ReplaceStream(pad, role);
     g_object_set_data(G_OBJECT(sink), kReplacing, nullptr);
+    if (!isReplaced) {
+      GST_ELEMENT_ERROR(sink, RESOURCE, FAILED, ("The sound server makes no new stream"),
+                        (nullptr));
+    }
   }
   return GST_PAD_PROBE_OK;
 }

@@ -11,7 +11,7 @@ namespace Desktop {
 ElementPtr MakeAudioSink();
 
 /// For any thread. \return whether \p object is such a sink between two streams. Whoever asks for
-/// the time then makes it post a failure that is none; a real one comes again with the next sound.
+/// the time then makes it post a failure that is none; a real one comes afterwards.
 bool IsReplacingStream(GstObject* object);
 
 }  // namespace Desktop

@@ -28,7 +28,7 @@ namespace {
 using Zelkora::Media::AudioVolumeManager;
 using Clock = std::chrono::steady_clock;
 
-constexpr int kProcesses = 150;  // of each side
+constexpr int kProcesses = 300;  // of each side
 constexpr int kRounds = 20;      // in each of them
 constexpr int kMax = 15;
 constexpr char kEntry[] = "sink-input-by-media-role:music";

@@ -131,7 +131,7 @@ void Device::OnStreamEvent(int type, std::uint32_t index) {
   if (stream != nullptr && std::exchange(stream->isEchoDue, false)) return;
   questions_.ExpectNews();
   // Not at once, because waking threads up takes time: the server has its question first.
-  loop_.CallWhenIdle([this] { reports_.ExpectLevel(); });
+  loop_.ExpectAnswer([this] { reports_.ExpectLevel(); });
 }
 
 void Device::OnStreamRemoved(std::uint32_t index) {

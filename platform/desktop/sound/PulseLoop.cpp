@@ -46,16 +46,25 @@ void PulseLoop::Run() {
   pa_mainloop_run(loop_, nullptr);
 }
 
+int PulseLoop::PollAwake(pollfd* files, unsigned long count) {
+  const Time end = Clock::now() + kMoment;
+  int ready = 0;
+  while ((ready = poll(files, count, 0)) == 0 && Clock::now() < end) std::this_thread::yield();
+  return ready;
+}
+
 int PulseLoop::Poll(pollfd* files, unsigned long count, int timeout, void* self) {
   auto& loop = *static_cast<PulseLoop*>(self);
   loop.files_.assign(files, files + count);
-  if (loop.onIdle_ != nullptr) std::exchange(loop.onIdle_, nullptr)();
+  const auto meanwhile = std::exchange(loop.meanwhile_, nullptr);
+  if (meanwhile != nullptr) meanwhile();
   loop.isDispatching_ = false;
   ++loop.turns_;
   const bool hasProgress = std::exchange(loop.hasProgress_, false) || loop.readers_ > 0;
   loop.mutex_.unlock();
   if (hasProgress) loop.TellProgress();
-  const int ready = poll(files, count, timeout);
+  int ready = meanwhile != nullptr ? PollAwake(files, count) : 0;
+  if (ready == 0) ready = poll(files, count, timeout);
   loop.mutex_.lock();
   loop.isDispatching_ = true;
   return ready;

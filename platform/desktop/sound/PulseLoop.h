@@ -45,9 +45,9 @@ class PulseLoop {
     return progress_.wait_until(lock, limit, condition);
   }
 
-  /// Calls a function once, on the thread, when everything is sent and it comes to wait for the
-  /// server; the last one that was given. The lock must be held, and is then.
-  void CallWhenIdle(std::function<void()> function) { onIdle_ = std::move(function); }
+  /// An answer is near: the thread waits for it awake, a moment at most, having called \p meanwhile
+  /// once everything is sent. The lock must be held, and is then; the last function counts.
+  void ExpectAnswer(std::function<void()> meanwhile) { meanwhile_ = std::move(meanwhile); }
 
   /// Ends the thread. The lock must not be held, and goes on working.
   void Stop();
@@ -56,16 +56,18 @@ class PulseLoop {
   /// A local server answers in less, and waking up would take as long again.
   static constexpr std::chrono::microseconds kMoment{300};
 
+  static int PollAwake(pollfd* files, unsigned long count);
   static int Poll(pollfd* files, unsigned long count, int timeout, void* self);
   void Run();
   void WaitAwake(std::unique_lock<std::mutex>& lock, Time end);
   void TellProgress();
   bool HasUnread();
+  int WaitForServer(int timeout);
 
   std::mutex mutex_;
   pa_mainloop* loop_;
-  std::vector<pollfd> files_;  // that the thread waits for, or waited for last
-  std::function<void()> onIdle_;
+  std::vector<pollfd> files_;        // that the thread waits for, or waited for last
+  std::function<void()> meanwhile_;  // null: no answer is near
   std::condition_variable progress_;
   std::atomic<unsigned> progressCount_{0};  // for those who wait awake
   bool isDispatching_ = false;              // the thread holds the lock

@@ -55,20 +55,12 @@ int Device::AwaitPicture(Lock& lock, Time limit) {
   return AwaitPicture(lock, limit, [] { return true; });
 }
 
-int Device::ReadEvents(Lock& lock, Time limit) {
+int Device::Refresh(Lock& lock, Time limit) {
   if (const int error = AwaitPicture(lock, limit)) return error;
   if (!loop_.AwaitReading(lock, limit)) return kTimedOut;
   if (areVolumesDue_) AskForVolumes();
-  return SOUND_MANAGER_ERROR_NONE;
-}
-
-int Device::AwaitAnswers(Lock& lock, Time limit, std::uint64_t count) {
-  return AwaitPicture(lock, limit, [=] { return questions_.AreAnswered(count); });
-}
-
-int Device::Refresh(Lock& lock, Time limit) {
-  if (const int error = ReadEvents(lock, limit)) return error;
-  return AwaitAnswers(lock, limit, questions_.GetAsked());
+  return AwaitPicture(
+      lock, limit, [this, asked = questions_.GetAsked()] { return questions_.AreAnswered(asked); });
 }
 
 int Device::Await(Lock& lock, Time limit, const Batch& batch) {
@@ -86,8 +78,7 @@ int Device::SetLevel(Category category, int level) {
   Lock lock(loop_.GetMutex());
   const Time limit = GetLimit();
   // What is stored is written as a whole, so what others have changed must be known.
-  if (const int error = ReadEvents(lock, limit)) return error;
-  if (const int error = AwaitAnswers(lock, limit, questions_.GetNews())) return error;
+  if (const int error = Refresh(lock, limit)) return error;
   if (!volumes_.AreStored()) return SOUND_MANAGER_ERROR_INVALID_OPERATION;
   Batch batch(loop_, [=] { volumes_.OnDone(category, level); });
   volumes_.Send(connection_.GetContext(), category, level, !isPipeWire_, batch);

@@ -65,13 +65,7 @@ class Device final : private Connection::Owner, private CallSession::Owner {
   /// Waits until there is a picture, as the server told it last. \return a native code
   int AwaitPicture(Lock& lock, Time limit);
 
-  /// Waits until all that the server has sent has been read, and asks about it. \return a native code
-  int ReadEvents(Lock& lock, Time limit);
-
-  /// Waits until that many questions are answered. \return a native code
-  int AwaitAnswers(Lock& lock, Time limit, std::uint64_t count);
-
-  /// Waits until the picture is as the server was when this was called. \return a native code
+  /// Waits until all that the server has sent is in the picture. \return a native code
   int Refresh(Lock& lock, Time limit);
 
   /// Waits for the answers to a batch. \return a native code
@@ -93,6 +87,7 @@ class Device final : private Connection::Owner, private CallSession::Owner {
   void AskForStream(std::uint32_t index);
   void AskForVolumes();
   void AskForVolumesSoon();
+  void AskLater();
   void AskForChangesOfVolumes();
 
   /// \name Events of the server
@@ -124,7 +119,7 @@ class Device final : private Connection::Owner, private CallSession::Owner {
   Streams streams_;
   Volumes volumes_{reports_, streams_};
   bool areVolumesDue_ = false;
-  Timer volumesTimer_{loop_, [this] { AskForVolumes(); }};
+  Timer later_{loop_, [this] { AskLater(); }};
   int ownWrites_ = 0;  // of stored volumes, whose events haven't come yet
   Output output_{reports_, streams_};
   Interruptions interruptions_{reports_, streams_};

@@ -15,8 +15,8 @@ constexpr auto kWatched = static_cast<pa_subscription_mask_t>(
     PA_SUBSCRIPTION_MASK_SERVER | PA_SUBSCRIPTION_MASK_SINK | PA_SUBSCRIPTION_MASK_SINK_INPUT |
     PA_SUBSCRIPTION_MASK_MODULE);
 
-/// How long stored volumes may wait to be asked for.
-constexpr std::chrono::milliseconds kVolumesPause{10};
+/// How long what is hardly news may wait to be asked for.
+constexpr std::chrono::milliseconds kLater{10};
 
 Device& ToDevice(void* self) { return *static_cast<Device*>(self); }
 
@@ -40,7 +40,7 @@ void Device::OnDisconnected(bool isLost) {
   isComplete_ = false;
   questions_.Forget();
   areVolumesDue_ = false;
-  volumesTimer_.Stop();
+  later_.Stop();
   streams_.Clear();
   output_.OnNone();
   for (auto& [number, call] : calls_) call.Drop();
@@ -68,18 +68,24 @@ void Device::AskForStream(std::uint32_t index) {
 
 void Device::AskForVolumes() {
   areVolumesDue_ = false;
-  volumesTimer_.Stop();
   // PipeWire acknowledges a write before it can be read, and so would seem to take it back.
   if (isPipeWire_ && isComplete_) return;
   questions_.Ask(pa_ext_stream_restore_read(connection_.GetContext(), OnVolume, this));
-  questions_.ExpectNews();
 }
 
 /// While streams are being asked, their answers are likely to tell the same. The question makes work
 /// for the server, which somebody who drags a slider would feel.
 void Device::AskForVolumesSoon() {
   if (questions_.AreAllAnswered()) return AskForVolumes();
-  if (!std::exchange(areVolumesDue_, true)) volumesTimer_.Start(kVolumesPause);
+  areVolumesDue_ = true;
+  later_.Start(kLater);
+}
+
+void Device::AskLater() {
+  if (areVolumesDue_) AskForVolumes();
+  for (const auto& [index, stream] : streams_.All()) {
+    if (stream.isToBeRead) AskForStream(index);
+  }
 }
 
 /// Without the module that keeps volumes this is refused, so it is asked again when modules come.
@@ -126,10 +132,12 @@ void Device::OnSinkEvent(int type, std::uint32_t index) {
 
 void Device::OnStreamEvent(int type, std::uint32_t index) {
   if (type == PA_SUBSCRIPTION_EVENT_REMOVE) return OnStreamRemoved(index);
-  AskForStream(index);
   Stream* stream = streams_.Find(index);
-  if (stream != nullptr && std::exchange(stream->isEchoDue, false)) return;
-  questions_.ExpectNews();
+  if (stream != nullptr && std::exchange(stream->isEchoDue, false)) {
+    stream->isToBeRead = true;  // another program may have changed it at the same moment
+    return later_.Start(kLater);
+  }
+  AskForStream(index);
   // Not at once, because waking threads up takes time: the server has its question first.
   loop_.ExpectAnswer([this] { reports_.ExpectLevel(); });
 }

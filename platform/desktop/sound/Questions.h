@@ -19,24 +19,17 @@ class Questions {
     return true;
   }
 
-  /// What has been asked may be answered with something new.
-  void ExpectNews() { news_ = asked_; }
-
   void OnAnswered() { ++answered_; }
 
   /// Those on the way won't be answered.
   void Forget() { answered_ = asked_; }
 
   std::uint64_t GetAsked() const { return asked_; }
-
-  /// \return how many answers bring all the news
-  std::uint64_t GetNews() const { return news_; }
   bool AreAnswered(std::uint64_t asked) const { return answered_ >= asked; }
   bool AreAllAnswered() const { return answered_ == asked_; }
 
  private:
   std::uint64_t asked_ = 0;
-  std::uint64_t news_ = 0;
   std::uint64_t answered_ = 0;
 };
 

@@ -22,7 +22,8 @@ struct Stream {
   bool isOwn = false;     ///< of this process
   bool isPlayer = false;  ///< of one of this process's players
   bool isBeingRead = false;
-  bool isEchoDue = false;  ///< this process has moved it, of which the server will tell
+  bool isToBeRead = false;  ///< though hardly anything new is known of it
+  bool isEchoDue = false;   ///< this process has moved it, of which the server will tell
 
   bool IsHeard() const { return !isCorked && !isMuted; }
   bool HasRole() const { return role != kNoRole; }

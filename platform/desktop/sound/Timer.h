@@ -16,7 +16,7 @@ class Timer {
   Timer(const Timer&) = delete;
   Timer& operator=(const Timer&) = delete;
 
-  /// Calls the function once, when \p time has passed.
+  /// Calls the function once, when \p time has passed, unless it waits for its time already.
   void Start(std::chrono::milliseconds time);
   void Stop();
 
@@ -26,6 +26,7 @@ class Timer {
   PulseLoop& loop_;
   const std::function<void()> onTime_;
   pa_time_event* event_ = nullptr;
+  bool isRunning_ = false;
 };
 
 }  // namespace Desktop

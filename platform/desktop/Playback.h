@@ -15,7 +15,8 @@ namespace Desktop {
 /// An open file: a pipeline that plays it, paused at first.
 ///
 /// Operations give back an error code of the player interface and log their failures. None waits
-/// without a bound. After a failure of the pipeline, or an answer that didn't come in time, every
+/// without a bound, but for a sound server that is stopped and not gone: GStreamer's sink waits until it
+/// goes on or ends. After a failure of the pipeline, or an answer that didn't come in time, every
 /// further operation fails: the file has to be opened again. For one thread at a time.
 class Playback {
  public:

@@ -1,11 +1,12 @@
 // The desktop player's effects, on sound that sox makes and measures: it is rendered with the effects
 // that are set, and the file is judged.
 
+#include "GstreamerEnd.h"
+
 #include <Tizen/Base/Result.h>
 #include <Tizen/Media/Player.h>
 #include <Zelkora/Media/AudioEffector.h>
 #include <gmock/gmock.h>
-#include <gst/gst.h>
 #include <unistd.h>
 
 #include <array>
@@ -21,14 +22,6 @@ namespace {
 
 using namespace Zelkora::Media;
 using Tizen::Media::Player;
-
-/// Lets GStreamer look for leaks when it is told to.
-class GstreamerEnd : public testing::Environment {
-  void TearDown() override {
-    if (gst_is_initialized()) gst_deinit();
-  }
-};
-const auto* const kGstreamerEnd = testing::AddGlobalTestEnvironment(new GstreamerEnd);
 
 std::string RunCommand(const std::string& command) {
   FILE* output = popen((command + " 2>&1").c_str(), "r");

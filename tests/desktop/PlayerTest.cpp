@@ -1,6 +1,8 @@
 // The media files are made beforehand by make-media, in the directory that ZELKORA_TEST_MEDIA
 // names.
 
+#include "GstreamerEnd.h"
+
 #include <Tizen/Base/Result.h>
 #include <Tizen/Media/Player.h>
 #include <Tizen/Media/PlayerImpl.h>

@@ -121,17 +121,6 @@ void ExitInsideACallback() {
   for (;;) pause();
 }
 
-void ExitWhileAnotherThreadReports() {
-  SetCallback([](int, int, void*) {});
-  static auto& gate = *new Gate;  // outlives the thread that opens it
-  std::thread([] {
-    Simulated::ReportVolume(4, 0);
-    gate.Open();
-    for (;;) Simulated::ReportVolume(4, 1);
-  }).detach();
-  gate.Pass();
-}
-
 TEST(ProcessDeathTest, EndsCleanlyWhateverTheSoundManagerIsDoing) {
   const std::pair<const char*, void (*)()> kEnds[] = {
       {"reports on the way",
@@ -140,7 +129,6 @@ TEST(ProcessDeathTest, EndsCleanlyWhateverTheSoundManagerIsDoing) {
          ReportMany();
        }},
       {"inside a callback", ExitInsideACallback},
-      {"while another thread reports", ExitWhileAnotherThreadReports},
       {"without threads at first",
        [] {
          const auto set = [] {

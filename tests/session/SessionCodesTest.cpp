@@ -38,13 +38,8 @@ class SessionCodes : public ManagerTest<Session> {
 
 TEST_F(SessionCodes, CodesBecomeEventsAndTheEndOfACode2IsSwallowedOnce) {
   const std::pair<std::vector<int>, std::string> rows[] = {
-      {{5, 0}, "started finished "},
-      {{6, 0}, "started finished "},
-      {{0}, "finished "},
-      {{1, 0}, "disrupted finished "},
-      {{3, 0}, "disrupted finished "},
-      {{4, 0}, "disrupted finished "},
-      {{2, 0}, "disrupted "},
+      {{5, 0, 6, 0}, "started finished started finished "},
+      {{0, 1, 3, 4, 0}, "finished disrupted disrupted disrupted finished "},
       {{2, 0, 0}, "disrupted finished "},
       {{2, 5, 0}, "disrupted started "},
       {{2, 1, 3, 4, 6, 0, 0}, "disrupted disrupted disrupted disrupted started finished "},

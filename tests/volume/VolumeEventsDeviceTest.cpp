@@ -6,7 +6,6 @@
 #include <climits>
 #include <deque>
 #include <optional>
-#include <thread>
 
 namespace Zelkora::Media {
 namespace {
@@ -79,46 +78,6 @@ struct Counter : IAudioVolumeEventListener {
   int count = 0;
   bool inOrder = true;
 };
-
-TEST_F(VolumeDevice, ListenersComeAndGoWhileTwoSourcesReport) {
-  struct Restless : Counter {
-    void OnAlarmVolumeChanged(int level) override {
-      Volume& volume = *Volume::GetInstance();
-      EXPECT_EQ(volume.RemoveAudioVolumeEventListener(*this), E_SUCCESS);
-      EXPECT_EQ(volume.SetRingtoneVolumeLevel(level % 10), E_SUCCESS);
-      EXPECT_EQ(volume.AddAudioVolumeEventListener(*this), E_SUCCESS);
-    }
-  };
-  constexpr int kChanges = 2000;
-  Host::RecordCalls(false);
-  Added<Counter> steady;
-  Added<Restless> restless;
-  std::atomic<int> sources{2};
-  const auto report = [&](int type) {
-    for (int level = 0; level < kChanges; ++level) Simulated::ReportVolume(type, level);
-    --sources;
-  };
-  std::thread media(report, 4), alarm(report, 2);
-  const auto comeAndGo = [&] {
-    while (sources > 0) Added<VolumeListener> shortLived;
-  };
-  std::thread visitor(comeAndGo);
-  comeAndGo();
-  for (std::thread* thread : {&media, &alarm, &visitor}) thread->join();
-  Host::WaitUntilDelivered();
-  EXPECT_EQ(steady.count, kChanges);
-  EXPECT_TRUE(steady.inOrder);
-}
-
-TEST_F(VolumeDevice, ListenersThatHaveGoneLeaveNothingBehind) {
-  Host::RecordCalls(false);  // the record would grow
-  const std::ptrdiff_t live = CountLiveAllocations();
-  for (int i = 0; i < 100; ++i) Added<VolumeListener> passing;
-  EXPECT_LT(CountLiveAllocations(), live + kKeptByTheDevice);
-  VolumeListener listener;
-  FailingAllocation failing(1);
-  EXPECT_EQ(manager.AddAudioVolumeEventListener(listener), E_OUT_OF_MEMORY);
-}
 
 /// \return how many changes are reported to that many listeners: `ZELKORA_TEST_SCALE` per cent of a
 /// million. Unless the environment says it, 1 and 10 listeners get the whole million and 1,000 a

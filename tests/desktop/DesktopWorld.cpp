@@ -102,8 +102,10 @@ std::vector<int> GetCallModes() {
   std::vector<int> modes;
   for (const ListedStream& stream : ListStreams("media.role = \"phone\"")) {
     for (int mode = 0; mode < 3; ++mode) {
-      const std::string shown = std::string("zelkora.call.mode = \"") + kModes[mode] + "\"";
-      if (stream.description.find(shown) != std::string::npos) modes.push_back(mode);
+      const auto shows = [&](const std::string& property) {
+        return stream.description.find(property + kModes[mode] + "\"") != std::string::npos;
+      };
+      if (shows("call.mode = \"") && shows("media.name = \"zelkora call: ")) modes.push_back(mode);
     }
   }
   return modes;

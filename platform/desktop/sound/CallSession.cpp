@@ -36,8 +36,8 @@ void CallSession::Open(pa_context* context) {
   if (IsOpening() || IsOpen()) return;
   Drop();
   error_ = PA_OK;
-  stream_.reset(pa_stream_new_with_proplist(context, "zelkora call", &kSilence, nullptr,
-                                            DescribeMode(mode_).get()));
+  stream_.reset(
+      pa_stream_new_with_proplist(context, nullptr, &kSilence, nullptr, DescribeMode(mode_).get()));
   if (stream_ == nullptr) {
     error_ = pa_context_errno(context);
     return;

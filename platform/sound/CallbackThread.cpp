@@ -22,7 +22,7 @@ void CallbackThread::Set(Kind kind, Callback callback) {
   std::lock_guard lock(mutex_);
   Start();
   std::lock_guard callLock(callMutex_);
-  SlotOf(kind).callback = std::move(callback);
+  SlotOf(kind) = {std::move(callback), postedCount_};
 }
 
 void CallbackThread::Unset(Kind kind) {

@@ -39,7 +39,7 @@ class CallbackThread {
   /// report are one step and cost one lock
   explicit CallbackThread(std::mutex& stateMutex) : mutex_(stateMutex) {}
 
-  /// Sets the callback for one kind of reports and starts the thread unless it runs; throws when
+  /// Sets the callback for one kind of reports, those from now on, and starts the thread unless it runs; throws when
   /// memory is short or the thread can't be started.
   void Set(Kind kind, Callback callback);
 

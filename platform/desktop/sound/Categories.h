@@ -22,6 +22,9 @@ inline constexpr Category kMedia = 4;
 inline constexpr Category kCall = 5;
 inline constexpr std::size_t kCategories = 6;
 
+/// What stands before a role in the name of its stored volume.
+inline constexpr char kEntryPrefix[] = "sink-input-by-media-role:";
+
 struct RoleRow {
   const char* role;
   Category category;

@@ -128,6 +128,7 @@ void Device::SetCallback(Host::Kind kind, Reports::Callback callback) {
 void Device::AwaitReports() {
   {
     Lock lock(loop_.GetMutex());
+    if (connection_.GetContext() != nullptr) AskLater();
     Refresh(lock, GetLimit());  // without a server there is nothing to read
   }
   reports_.AwaitCallbacks();

@@ -65,7 +65,8 @@ class Device final : private Connection::Owner, private CallSession::Owner {
   /// Waits until there is a picture, as the server told it last. \return a native code
   int AwaitPicture(Lock& lock, Time limit);
 
-  /// Waits until all that the server has sent is in the picture. \return a native code
+  /// Waits until all that the server has sent is in the picture, but for what is hardly news and is
+  /// read within milliseconds. \return a native code
   int Refresh(Lock& lock, Time limit);
 
   /// Waits for the answers to a batch. \return a native code

@@ -147,7 +147,7 @@ void Device::OnStreamRemoved(std::uint32_t index) {
   // the corking out.
   const Stream* stream = streams_.Find(index);
   if (stream != nullptr && stream->isPlayer && stream->IsHeard() && !stream->isBeingRead &&
-      !WasStreamJustReplaced()) {
+      !stream->isToBeRead && !WasStreamJustReplaced()) {
     reports_.ReportInterruption(kTakenOver);
   }
   streams_.Remove(index);
@@ -172,19 +172,23 @@ void Device::OnOutput(pa_context*, const pa_sink_info* info, int end, void* self
   device.OnAnswered();
 }
 
-void Device::OnStream(pa_context*, const pa_sink_input_info* info, int end, void* self) {
+void Device::OnStream(pa_context*, const pa_sink_input_info* info, int, void* self) {
   Device& device = ToDevice(self);
   if (info != nullptr) return device.PutStream(*info);
-  if (end < 0) device.streams_.OnUnanswered();
   device.OnAnswered();
 }
 
 void Device::PutStream(const pa_sink_input_info& info) {
   const Stream* known = streams_.Find(info.index);
-  const Stream stream = streams_.Describe(info);
+  Stream stream = streams_.Describe(info);
+  // PipeWire acknowledges a volume before it tells of it.
+  if (isPipeWire_ && known != nullptr && known->isEchoDue) {
+    stream.volume = known->volume;
+    stream.isEchoDue = true;
+  }
   const bool isMoved = known != nullptr && known->GetLevel() != stream.GetLevel();
   streams_.Put(info.index, stream);
-  if (isMoved) volumes_.OnStreamMoved(stream, !isPipeWire_ && stream.HasRole());
+  if (isMoved) volumes_.OnStreamMoved(stream, !isPipeWire_ && stream.hasStoredVolume);
   interruptions_.Update();
 }
 

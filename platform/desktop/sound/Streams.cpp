@@ -37,6 +37,8 @@ Stream Streams::Describe(const pa_sink_input_info& info) const {
     stream.role = FindRole(role);
     if (stream.HasRole()) stream.category = kRoles[stream.role].category;
   }
+  stream.hasStoredVolume =
+      stream.HasRole() && is("module-stream-restore.id", std::string(kEntryPrefix) + role);
   stream.sink = info.sink;
   stream.volume = info.volume;
   stream.canChangeVolume = info.has_volume && info.volume_writable;
@@ -51,10 +53,6 @@ Stream Streams::Describe(const pa_sink_input_info& info) const {
 Stream* Streams::Find(std::uint32_t index) {
   const auto found = streams_.find(index);
   return found == streams_.end() ? nullptr : &found->second;
-}
-
-void Streams::OnUnanswered() {
-  for (auto& [index, stream] : streams_) stream.isBeingRead = false;  // whichever it was about
 }
 
 bool Streams::IsAnyMuted(Category category) const {

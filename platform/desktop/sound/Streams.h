@@ -17,6 +17,7 @@ struct Stream {
   std::uint32_t sink = PA_INVALID_INDEX;
   pa_cvolume volume = {};
   bool canChangeVolume = false;
+  bool hasStoredVolume = false;  ///< the server keeps its volume under its role
   bool isMuted = false;
   bool isCorked = false;
   bool isOwn = false;     ///< of this process
@@ -46,9 +47,6 @@ class Streams {
   void Put(std::uint32_t index, const Stream& stream) { streams_[index] = stream; }
   void Remove(std::uint32_t index) { streams_.erase(index); }
   void Clear() { streams_.clear(); }
-
-  /// A question about a stream wasn't answered.
-  void OnUnanswered();
 
   Map& All() { return streams_; }
 

@@ -6,8 +6,6 @@
 namespace Desktop {
 namespace {
 
-constexpr char kEntryPrefix[] = "sink-input-by-media-role:";
-
 /// \return the volume with another level, in the same balance
 pa_cvolume Scale(pa_cvolume volume, int level) {
   pa_cvolume_scale(&volume, ToVolume(level));
@@ -117,7 +115,7 @@ void Volumes::Send(pa_context* context, Category category, int level, bool moves
   });
   for (const auto& [index, stream] : streams_.All()) {
     if (stream.category != category || !stream.canChangeVolume) continue;
-    if (movesStreams && stream.HasRole()) continue;
+    if (movesStreams && stream.hasStoredVolume) continue;
     const pa_cvolume volume = Scale(stream.volume, level);
     batch.AddOptional([&, number = index](pa_context_success_cb_t onAnswer, void* data) {
       return pa_context_set_sink_input_volume(context, number, &volume, onAnswer, data);

@@ -39,8 +39,8 @@ class CallbackThread {
   /// report are one step and cost one lock
   explicit CallbackThread(std::mutex& stateMutex) : mutex_(stateMutex) {}
 
-  /// Sets the callback for one kind of reports, those from now on, and starts the thread unless it runs; throws when
-  /// memory is short or the thread can't be started.
+  /// Sets the callback for one kind of reports, those from now on, and starts the thread unless it
+  /// runs; throws when memory is short or the thread can't be started.
   void Set(Kind kind, Callback callback);
 
   /// Removes the callback and drops the reports for it. No call of it is running when this returns,

@@ -62,7 +62,6 @@ class PulseLoop {
   void WaitAwake(std::unique_lock<std::mutex>& lock, Time end);
   void TellProgress();
   bool HasUnread();
-  int WaitForServer(int timeout);
 
   std::mutex mutex_;
   pa_mainloop* loop_;

@@ -95,15 +95,14 @@ bool ReplaceStream(GstPad* pad, const char* role) {
 GstPadProbeReturn OnSound(GstPad* pad, GstPadProbeInfo* info, gpointer data) {
   GstElement* sink = GST_ELEMENT(data);
   const char* role = GetPlayerRole();
-  // Not before the next sound, lest a thread that asked meanwhile is heard too late.
-  g_object_set_data(G_OBJECT(sink), kReplacing, nullptr);
   if (!HasRole(sink, role)) {
     AwaitEnd(sink, GST_PAD_PROBE_INFO_BUFFER(info));
     SetStreamProperties(sink, role);
     NoteStreamReplaced();
     g_object_set_data(G_OBJECT(sink), kReplacing, sink);
-    if (!ReplaceStream(pad, role)) {
-      g_object_set_data(G_OBJECT(sink), kReplacing, nullptr);
+    const bool isReplaced = ReplaceStream(pad, role);
+    g_object_set_data(G_OBJECT(sink), kReplacing, nullptr);
+    if (!isReplaced) {
       GST_ELEMENT_ERROR(sink, RESOURCE, FAILED, ("The sound server makes no new stream"),
                         (nullptr));
     }

@@ -1,16 +1,37 @@
 #include <Zelkora/Media/AudioEffector.h>
 
 #include "AudioEffectorImpl.h"
-#include "frame/Assert.h"
-#include "frame/Capabilities.h"
-#include "frame/Log.h"
+#include "base/Assert.h"
+#include "base/Capabilities.h"
+#include "base/Log.h"
 
+#include <functional>
 #include <memory>
 #include <new>
+#include <utility>
 
 namespace Zelkora::Media {
 
 using Tizen::Base::Collection::IListT;
+using Impl = _AudioEffectorImpl;
+
+namespace {
+
+/// Runs an operation whose failure the effector reports once more, as \p failure.
+template <typename Operation, typename... Arguments>
+result Perform(Impl* pImpl, Signature caller, const char* failure, Operation operation,
+               Arguments&&... arguments) {
+  ClearLastResult();
+  if (pImpl == nullptr) {
+    AppassertfInternal("__pAudioEffectorImpl != null", caller.text, caller.line,
+                       kAppNotYetConstructed);
+    return E_INVALID_STATE;
+  }
+  const result r = std::invoke(operation, pImpl, std::forward<Arguments>(arguments)...);
+  return r == E_SUCCESS ? r : FailTagged(r, caller, failure, GetErrorMessage(r));
+}
+
+}  // namespace
 
 AudioEffector::AudioEffector() : __pAudioEffectorImpl(nullptr) {}
 
@@ -24,7 +45,7 @@ result AudioEffector::Construct(Tizen::Media::Player& player) {
   if (r != E_SUCCESS) return r;
   if (!APP_ASSERT(__pAudioEffectorImpl == null, kAlreadyConstructed)) return E_INVALID_STATE;
 
-  std::unique_ptr<_AudioEffectorImpl> pImpl(new (std::nothrow) _AudioEffectorImpl);
+  std::unique_ptr<Impl> pImpl(new (std::nothrow) Impl);
   if (pImpl == nullptr) {
     return FailTagged(E_OUT_OF_MEMORY, __PRETTY_FUNCTION__,
                       "[E_OUT_OF_MEMORY] Memory allocation failed");
@@ -34,8 +55,8 @@ result AudioEffector::Construct(Tizen::Media::Player& player) {
     return FailTagged(r, __PRETTY_FUNCTION__, "[%s] Failed to construct pAudioEffectorImpl.",
                       GetErrorMessage(r));
   }
-  SetLastResult(E_SUCCESS);
   __pAudioEffectorImpl = pImpl.release();
+  SetLastResult(E_SUCCESS);
   return E_SUCCESS;
 }
 
@@ -50,31 +71,22 @@ IListT<AudioEffectPreset>* AudioEffector::GetSupportedEffectPresetListN() const 
 }
 
 result AudioEffector::SetEffectLevel(AudioEffectType type, int level) {
-  ClearLastResult();
-  if (!APP_ASSERT(__pAudioEffectorImpl != null, kAppNotYetConstructed)) return E_INVALID_STATE;
-  const result r = __pAudioEffectorImpl->SetEffectLevel(type, level);
-  if (r == E_SUCCESS) return r;
-  return FailTagged(r, __PRETTY_FUNCTION__, "[%s] Failed to perform SetEffectLevel operation.",
-                    GetErrorMessage(r));
+  return Perform(__pAudioEffectorImpl, __PRETTY_FUNCTION__,
+                 "[%s] Failed to perform SetEffectLevel operation.", &Impl::SetEffectLevel, type,
+                 level);
 }
 
 result AudioEffector::GetEffectLevel(AudioEffectType type, int& level) const {
-  ClearLastResult();
-  if (!APP_ASSERT(__pAudioEffectorImpl != null, kAppNotYetConstructed)) return E_INVALID_STATE;
-  const result r = __pAudioEffectorImpl->GetEffectLevel(type, level);
-  if (r == E_SUCCESS) return r;
-  return FailTagged(r, __PRETTY_FUNCTION__, "[%s] Failed to perform GetEffectLevel operation.",
-                    GetErrorMessage(r));
+  return Perform(__pAudioEffectorImpl, __PRETTY_FUNCTION__,
+                 "[%s] Failed to perform GetEffectLevel operation.", &Impl::GetEffectLevel, type,
+                 level);
 }
 
 result AudioEffector::GetEffectLevelRange(AudioEffectType type, int& minValue,
                                           int& maxValue) const {
-  ClearLastResult();
-  if (!APP_ASSERT(__pAudioEffectorImpl != null, kAppNotYetConstructed)) return E_INVALID_STATE;
-  const result r = __pAudioEffectorImpl->GetEffectLevelRange(type, minValue, maxValue);
-  if (r == E_SUCCESS) return r;
-  return FailTagged(r, __PRETTY_FUNCTION__, "[%s] Failed to perform GetEffectLevelRange operation.",
-                    GetErrorMessage(r));
+  return Perform(__pAudioEffectorImpl, __PRETTY_FUNCTION__,
+                 "[%s] Failed to perform GetEffectLevelRange operation.",
+                 &Impl::GetEffectLevelRange, type, minValue, maxValue);
 }
 
 result AudioEffector::ResetAllToDefault() {
@@ -84,12 +96,9 @@ result AudioEffector::ResetAllToDefault() {
 }
 
 result AudioEffector::SetEffectPreset(AudioEffectPreset preset) {
-  ClearLastResult();
-  if (!APP_ASSERT(__pAudioEffectorImpl != null, kAppNotYetConstructed)) return E_INVALID_STATE;
-  const result r = __pAudioEffectorImpl->SetEffectPreset(preset);
-  if (r == E_SUCCESS) return r;
-  return FailTagged(r, __PRETTY_FUNCTION__, "[%s] Failed to perform SetEffectPreset operation.",
-                    GetErrorMessage(r));
+  return Perform(__pAudioEffectorImpl, __PRETTY_FUNCTION__,
+                 "[%s] Failed to perform SetEffectPreset operation.", &Impl::SetEffectPreset,
+                 preset);
 }
 
 }  // namespace Zelkora::Media

@@ -1,8 +1,8 @@
 #include "AudioEffectorImpl.h"
 
 #include "EffectTables.h"
-#include "frame/Assert.h"
-#include "frame/Log.h"
+#include "base/Assert.h"
+#include "base/Log.h"
 
 #include <Tizen/Base/Collection/ArrayListT.h>
 #include <Tizen/Media/PlayerImpl.h>
@@ -27,15 +27,16 @@ constexpr char kUnsupportedPreset[] =
 template <typename T, typename Value>
 IListT<T>* MakeSupportedListN(int (*enumerate)(player_h, bool (*)(Value, void*), void*),
                               player_h hPlayer, bool (*callback)(Value, void*), const char* failure,
-                              Place place) {
+                              Signature caller) {
   std::unique_ptr<ArrayListT<T>> pList(new (std::nothrow) ArrayListT<T>);
   if (pList == nullptr) {
-    FailTagged(E_OUT_OF_MEMORY, place, "[E_OUT_OF_MEMORY] Memory allocation failed.");
+    FailTagged(E_OUT_OF_MEMORY, caller, "[E_OUT_OF_MEMORY] Memory allocation failed.");
     return nullptr;
   }
   const result r = ConvertPlayerError(enumerate(hPlayer, callback, pList.get()));
   if (r != E_SUCCESS) {
-    FailTagged(r, place, failure, GetErrorMessage(r));
+    FailTagged(r, caller, failure, GetErrorMessage(r));
+    pList->RemoveAll();
     return nullptr;
   }
   return pList.release();

@@ -7,10 +7,6 @@
 #include <Zelkora/Media/AudioEffector.h>
 #include <player.h>
 
-#include <algorithm>
-#include <array>
-#include <cstddef>
-
 namespace Zelkora::Media {
 
 template <typename Public, typename Platform>
@@ -23,17 +19,15 @@ using EffectTypeRow = EffectRow<AudioEffectType, audio_effect_e>;
 using PresetRow = EffectRow<AudioEffectPreset, audio_effect_preset_e>;
 
 /// In the order in which effects are put back.
-inline constexpr std::array<EffectTypeRow, 5> kEffects{{
-    {AUDIO_EFFECT_BASS, audio_effect_e(1)},
-    {AUDIO_EFFECT_TREBLE, audio_effect_e(2)},
-    {AUDIO_EFFECT_REVERB, audio_effect_e(3)},
-    {AUDIO_EFFECT_STEREO_WIDTH, audio_effect_e(4)},
+inline constexpr EffectTypeRow kEffects[] = {
+    {AUDIO_EFFECT_BASS, audio_effect_e(1)},     {AUDIO_EFFECT_TREBLE, audio_effect_e(2)},
+    {AUDIO_EFFECT_REVERB, audio_effect_e(3)},   {AUDIO_EFFECT_STEREO_WIDTH, audio_effect_e(4)},
     {AUDIO_EFFECT_DYNAMICS, audio_effect_e(5)},
-}};
+};
 
 inline constexpr audio_effect_preset_e kNeutralPlatformPreset = audio_effect_preset_e(1);
 
-inline constexpr std::array<PresetRow, 20> kPresets{{
+inline constexpr PresetRow kPresets[] = {
     {AUDIO_EFFECT_PRESET_NORMAL, kNeutralPlatformPreset},
     {AUDIO_EFFECT_PRESET_POP, audio_effect_preset_e(0)},
     {AUDIO_EFFECT_PRESET_ROCK, audio_effect_preset_e(2)},
@@ -54,36 +48,17 @@ inline constexpr std::array<PresetRow, 20> kPresets{{
     {AUDIO_EFFECT_PRESET_SPEECH, audio_effect_preset_e(17)},
     {AUDIO_EFFECT_PRESET_LOUDNESS, audio_effect_preset_e(18)},
     {AUDIO_EFFECT_PRESET_SMALL_SPEAKERS, audio_effect_preset_e(19)},
-}};
-
-template <typename Table, typename Field>
-constexpr std::size_t HighestValue(const Table& table, Field field) {
-  std::size_t highest = 0;
-  for (const auto& row : table) highest = std::max(highest, static_cast<std::size_t>(row.*field));
-  return highest;
-}
-
-/// \return the table's rows, each where the value of its field says; null where there is none. No value
-/// may come twice.
-template <std::size_t N, typename Table, typename Field>
-constexpr auto IndexRows(const Table& table, Field field) {
-  std::array<const typename Table::value_type*, N> rows{};
-  for (const auto& row : table) {
-    auto& place = rows[static_cast<std::size_t>(row.*field)];
-    place = place == nullptr ? &row : throw "a value comes twice";  // an error when compiled
-  }
-  return rows;
-}
+};
 
 /// Finds the row of \p table whose field \p from holds \p value and writes its field \p to.
 template <auto& table, auto from, auto to, typename From, typename To>
 result LookUp(From value, To& found) noexcept {
-  constexpr std::size_t kEnd = 1 + HighestValue(table, from);
-  static constexpr auto rows = IndexRows<kEnd>(table, from);
-  const auto index = static_cast<unsigned>(value);
-  if (index >= kEnd || rows[index] == nullptr) return E_INVALID_ARG;
-  found = rows[index]->*to;
-  return E_SUCCESS;
+  for (const auto& row : table) {
+    if (row.*from != value) continue;
+    found = row.*to;
+    return E_SUCCESS;
+  }
+  return E_INVALID_ARG;
 }
 
 inline result ConvertToPlatformEffect(AudioEffectType type, audio_effect_e& effect) noexcept {
@@ -110,7 +85,7 @@ inline result ConvertFromPlatformPreset(audio_effect_preset_e platformPreset,
 constexpr result ConvertPlayerError(int error) noexcept {
   constexpr int kInvalidPlayerState = -26476510;
   static_assert(static_cast<unsigned>(kInvalidPlayerState) == 0xFE6C0022);
-  if (error == 0) return E_SUCCESS;  // apart, because it is nearly always that
+  if (error == 0) return E_SUCCESS;  // first: nearly every call
   switch (error) {
     case -22: return E_INVALID_ARG;
     case -12: return E_OUT_OF_MEMORY;

@@ -1,14 +1,16 @@
-#include "VideoKeyFrameSeekerImpl.h"
-
-#include "frame/Assert.h"
-#include "frame/Capabilities.h"
-#include "frame/Log.h"
-
 #include <Zelkora/Media/VideoKeyFrameSeeker.h>
 
+#include "VideoKeyFrameSeekerImpl.h"
+#include "base/Assert.h"
+#include "base/Capabilities.h"
+#include "base/Log.h"
+
+#include <memory>
 #include <new>
 
 namespace Zelkora::Media {
+
+using Impl = _VideoKeyFrameSeekerImpl;
 
 VideoKeyFrameSeeker::VideoKeyFrameSeeker() : __pVideoKeyFrameSeekerImpl(nullptr) {}
 
@@ -22,19 +24,17 @@ result VideoKeyFrameSeeker::Construct(Tizen::Media::Player& player) {
   if (r != E_SUCCESS) return r;
   if (!APP_ASSERT(__pVideoKeyFrameSeekerImpl == null, kAlreadyConstructed)) return E_INVALID_STATE;
 
-  __pVideoKeyFrameSeekerImpl = new (std::nothrow) _VideoKeyFrameSeekerImpl;
-  if (__pVideoKeyFrameSeekerImpl == nullptr) {
+  std::unique_ptr<Impl> pImpl(new (std::nothrow) Impl);
+  if (pImpl == nullptr) {
     return FailTagged(E_OUT_OF_MEMORY, __PRETTY_FUNCTION__,
                       "[E_OUT_OF_MEMORY] Memory allocation failed");
   }
-  r = __pVideoKeyFrameSeekerImpl->Construct(player);
+  r = pImpl->Construct(player);
   if (r != E_SUCCESS) {
-    FailTagged(r, __PRETTY_FUNCTION__, "[%s] Failed to construct __pVideoKeyFrameSeekerImpl.",
-               GetErrorMessage(r));
-    delete __pVideoKeyFrameSeekerImpl;
-    __pVideoKeyFrameSeekerImpl = nullptr;
-    return r;
+    return FailTagged(r, __PRETTY_FUNCTION__,
+                      "[%s] Failed to construct __pVideoKeyFrameSeekerImpl.", GetErrorMessage(r));
   }
+  __pVideoKeyFrameSeekerImpl = pImpl.release();
   SetLastResult(E_SUCCESS);
   return E_SUCCESS;
 }

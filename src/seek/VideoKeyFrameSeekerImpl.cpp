@@ -1,6 +1,6 @@
 #include "VideoKeyFrameSeekerImpl.h"
 
-#include "frame/Log.h"
+#include "base/Log.h"
 
 #include <Tizen/Media/PlayerImpl.h>
 

@@ -1,7 +1,7 @@
 #include "AudioSessionEvent.h"
 
 #include "AudioSessionEventArg.h"
-#include "frame/Log.h"
+#include "base/Log.h"
 
 #include <Zelkora/Media/IAudioSessionEventListener.h>
 

@@ -1,7 +1,7 @@
 #include "AudioSessionManagerImpl.h"
-#include "frame/Capabilities.h"
-#include "frame/Guard.h"
-#include "frame/ManagerLife.h"
+#include "base/Capabilities.h"
+#include "base/Guard.h"
+#include "base/ManagerLife.h"
 
 namespace Zelkora::Media {
 
@@ -30,15 +30,15 @@ AudioSessionManager::~AudioSessionManager() { delete __pImpl; }
 result AudioSessionManager::Construct() { return _ManagerLife::Construct(*this); }
 
 result AudioSessionManager::SetAudioSessionEventListener(IAudioSessionEventListener* pListener) {
-  return Forward(__pImpl, kAudioSessionPrivilege, &Impl::SetAudioSessionEventListener, pListener);
+  return Forward<&Impl::SetAudioSessionEventListener>(__pImpl, kAudioSessionPrivilege, pListener);
 }
 
 result AudioSessionManager::SetMode(AudioSessionMode mode) {
-  return Forward(__pImpl, kAudioSessionPrivilege, &Impl::SetMode, mode);
+  return Forward<&Impl::SetMode>(__pImpl, kAudioSessionPrivilege, mode);
 }
 
 AudioSessionMode AudioSessionManager::GetMode() const {
-  return Forward(__pImpl, kAudioSessionPrivilege, &Impl::GetMode);
+  return Forward<&Impl::GetMode>(__pImpl, kAudioSessionPrivilege);
 }
 
 }  // namespace Zelkora::Media

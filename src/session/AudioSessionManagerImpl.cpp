@@ -1,8 +1,9 @@
 #include "AudioSessionManagerImpl.h"
 
 #include "AudioSessionEvent.h"
-#include "frame/Log.h"
-#include "frame/SoundManagerError.h"
+#include "base/Log.h"
+#include "base/Native.h"
+#include "base/SoundManagerError.h"
 
 #include <Zelkora/Media/IAudioSessionEventListener.h>
 #include <sound_manager.h>
@@ -61,7 +62,11 @@ result _AudioSessionManagerImpl::Construct() {
   const result r = pEvent->Construct();
   if (r != E_SUCCESS) return Propagate(r);
 
-  const int error = sound_manager_set_session_interrupted_cb(SessionInterruptedCallback, this);
+  const int error = sound_manager_set_session_interrupted_cb(
+      [](auto code, void* userData) {
+        SessionInterruptedCallback(static_cast<int>(code), userData);
+      },
+      this);
   if (error != 0) {
     return Fail(E_SYSTEM,
                 "[E_SYSTEM] A system error has been occurred. Failed to perform "
@@ -79,7 +84,7 @@ _AudioSessionManagerImpl::~_AudioSessionManagerImpl() {
 }
 
 result _AudioSessionManagerImpl::SetMode(AudioSessionMode mode) {
-  const result r = Check(sound_manager_set_session_type(ToSessionType(mode)),
+  const result r = Check(CallNative(sound_manager_set_session_type, ToSessionType(mode)),
                          "Failed to perform sound_manager_set_session_type operation with error "
                          "code : 0x%x");
   if (r != E_SUCCESS || mode != AUDIO_SESSION_MODE_MEDIA_MIX) return r;
@@ -92,7 +97,7 @@ AudioSessionMode _AudioSessionManagerImpl::GetMode() const {
   int sessionType = 0;
   int first = 0;
   int second = 0;
-  result r = ConvertSoundManagerError(sound_manager_get_session_type(&sessionType));
+  result r = ConvertSoundManagerError(CallNative(sound_manager_get_session_type, &sessionType));
   if (r != E_SUCCESS) return Propagate(r), AUDIO_SESSION_MODE_MEDIA;
 
   const AudioSessionMode mode = ToMode(sessionType);

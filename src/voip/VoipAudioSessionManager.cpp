@@ -1,7 +1,7 @@
 #include "VoipAudioSessionManagerImpl.h"
-#include "frame/Capabilities.h"
-#include "frame/Guard.h"
-#include "frame/ManagerLife.h"
+#include "base/Capabilities.h"
+#include "base/Guard.h"
+#include "base/ManagerLife.h"
 
 namespace Zelkora::Media {
 
@@ -31,19 +31,19 @@ VoipAudioSessionManager::~VoipAudioSessionManager() { delete __pImpl; }
 result VoipAudioSessionManager::Construct() { return _ManagerLife::Construct(*this); }
 
 result VoipAudioSessionManager::EnterCallSession() {
-  return Forward(__pImpl, kVoipAudioSessionPrivilege, &Impl::EnterCallSession);
+  return Forward<&Impl::EnterCallSession>(__pImpl, kVoipAudioSessionPrivilege);
 }
 
 result VoipAudioSessionManager::ExitCallSession() {
-  return Forward(__pImpl, kVoipAudioSessionPrivilege, &Impl::ExitCallSession);
+  return Forward<&Impl::ExitCallSession>(__pImpl, kVoipAudioSessionPrivilege);
 }
 
 result VoipAudioSessionManager::SetCallSessionMode(VoipAudioSessionMode mode) {
-  return Forward(__pImpl, kVoipAudioSessionPrivilege, &Impl::SetCallSessionMode, mode);
+  return Forward<&Impl::SetCallSessionMode>(__pImpl, kVoipAudioSessionPrivilege, mode);
 }
 
 VoipAudioSessionMode VoipAudioSessionManager::GetCallSessionMode() const {
-  return Forward(__pImpl, kVoipAudioSessionPrivilege, &Impl::GetCallSessionMode);
+  return Forward<&Impl::GetCallSessionMode>(__pImpl, kVoipAudioSessionPrivilege);
 }
 
 }  // namespace Zelkora::Media

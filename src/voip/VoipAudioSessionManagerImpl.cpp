@@ -1,7 +1,8 @@
 #include "VoipAudioSessionManagerImpl.h"
 
-#include "frame/Log.h"
-#include "frame/SoundManagerError.h"
+#include "base/Log.h"
+#include "base/Native.h"
+#include "base/SoundManagerError.h"
 
 #include <array>
 
@@ -53,7 +54,8 @@ result _VoipAudioSessionManagerImpl::EnterCallSession() {
                 "[E_INVALID_OPERATION] A error has been occurred. The value of "
                 "__soundCallSessionHandle is not null.");
   }
-  const int error = sound_manager_call_session_create(kVoipCall, &__soundCallSessionHandle);
+  const int error =
+      CallNative(sound_manager_call_session_create, kVoipCall, &__soundCallSessionHandle);
   result r = ConvertSoundManagerError(error);
   if (r == E_SUCCESS && __soundCallSessionHandle != nullptr) return E_SUCCESS;
 
@@ -96,8 +98,9 @@ result _VoipAudioSessionManagerImpl::SetCallSessionMode(VoipAudioSessionMode mod
     return Fail(E_INVALID_ARG,
                 " [E_INVALID_ARG] Invalid argument is used. The mode is not correct : %d", mode);
   }
-  const result r = ConvertSoundManagerError(sound_manager_call_session_set_mode(
-      __soundCallSessionHandle, kPlatformModes[static_cast<unsigned>(mode)]));
+  const result r = ConvertSoundManagerError(
+      CallNative(sound_manager_call_session_set_mode, __soundCallSessionHandle,
+                 kPlatformModes[static_cast<unsigned>(mode)]));
   if (r != E_SUCCESS) {
     return Fail(r, "[%s] Failed to perform sound_manager_call_session_set_mode operation.",
                 GetErrorMessage(r));
@@ -109,7 +112,8 @@ VoipAudioSessionMode _VoipAudioSessionManagerImpl::GetCallSessionMode() const {
   if (__soundCallSessionHandle == nullptr) return FailNotEntered(), VOIP_AUDIO_SESSION_MODE_NONE;
 
   int platformMode = 0;
-  const int error = sound_manager_call_session_get_mode(__soundCallSessionHandle, &platformMode);
+  const int error =
+      CallNative(sound_manager_call_session_get_mode, __soundCallSessionHandle, &platformMode);
   const result r = ConvertSoundManagerError(error);
   if (r != E_SUCCESS) {
     Fail(r,

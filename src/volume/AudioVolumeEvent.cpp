@@ -1,7 +1,7 @@
 #include "AudioVolumeEvent.h"
 
 #include "AudioVolumeEventArg.h"
-#include "frame/Log.h"
+#include "base/Log.h"
 
 #include <Zelkora/Media/IAudioVolumeEventListener.h>
 
@@ -25,7 +25,7 @@ static_assert(std::size(kVolumeChanged) == kSoundTypeCount);
 
 void Tell(IAudioVolumeEventListener& listener, const _AudioVolumeEventArg& arg) {
   const int type = arg.GetEventType();
-  if (type >= VOLUME_EVENT_SYSTEM && type <= VOLUME_EVENT_CALL) {
+  if (type >= VOLUME_EVENT_SYSTEM && type <= kSoundTypeCount) {
     (listener.*kVolumeChanged[type - VOLUME_EVENT_SYSTEM])(arg.GetVolumeLevel());
   } else if (type == VOLUME_EVENT_MUTE) {
     listener.OnMuteAllStatusChanged(arg.GetMuteStatus());

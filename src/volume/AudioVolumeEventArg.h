@@ -19,7 +19,8 @@ enum _AudioVolumeEventType : int {
   VOLUME_EVENT_CALL = SOUND_TYPE_CALL + 1,
   VOLUME_EVENT_MUTE = 7,
 };
-static_assert(VOLUME_EVENT_SYSTEM == 1 && VOLUME_EVENT_CALL == 6);
+static_assert(VOLUME_EVENT_SYSTEM == 1 && VOLUME_EVENT_CALL == kSoundTypeCount);
+static_assert(kSoundTypeCount < VOLUME_EVENT_MUTE, "a sound type's event would be the mute event");
 
 class _AudioVolumeEventTypeArg : public Tizen::Base::Runtime::IEventArg,
                                  public Tizen::Base::Object {

@@ -1,8 +1,8 @@
 #include "AudioVolumeManagerImpl.h"
 #include "SoundType.h"
-#include "frame/Capabilities.h"
-#include "frame/Guard.h"
-#include "frame/ManagerLife.h"
+#include "base/Capabilities.h"
+#include "base/Guard.h"
+#include "base/ManagerLife.h"
 
 namespace Zelkora::Media {
 
@@ -30,100 +30,100 @@ AudioVolumeManager::~AudioVolumeManager() { delete __pImpl; }
 result AudioVolumeManager::Construct() { return _ManagerLife::Construct(*this); }
 
 result AudioVolumeManager::GetSystemVolumeRange(int& min, int& max) const {
-  return Forward(__pImpl, kAudioVolumePrivilege, &Impl::GetVolumeRange, SOUND_TYPE_SYSTEM, min,
-                 max);
+  return Forward<&Impl::GetVolumeRange>(__pImpl, kAudioVolumePrivilege, SOUND_TYPE_SYSTEM, min,
+                                        max);
 }
 
 result AudioVolumeManager::GetNotificationVolumeRange(int& min, int& max) const {
-  return Forward(__pImpl, kAudioVolumePrivilege, &Impl::GetVolumeRange, SOUND_TYPE_NOTIFICATION,
-                 min, max);
+  return Forward<&Impl::GetVolumeRange>(__pImpl, kAudioVolumePrivilege, SOUND_TYPE_NOTIFICATION,
+                                        min, max);
 }
 
 result AudioVolumeManager::GetAlarmVolumeRange(int& min, int& max) const {
-  return Forward(__pImpl, kAudioVolumePrivilege, &Impl::GetVolumeRange, SOUND_TYPE_ALARM, min, max);
+  return Forward<&Impl::GetVolumeRange>(__pImpl, kAudioVolumePrivilege, SOUND_TYPE_ALARM, min, max);
 }
 
 result AudioVolumeManager::GetRingtoneVolumeRange(int& min, int& max) const {
-  return Forward(__pImpl, kAudioVolumePrivilege, &Impl::GetVolumeRange, SOUND_TYPE_RINGTONE, min,
-                 max);
+  return Forward<&Impl::GetVolumeRange>(__pImpl, kAudioVolumePrivilege, SOUND_TYPE_RINGTONE, min,
+                                        max);
 }
 
 result AudioVolumeManager::GetMediaVolumeRange(int& min, int& max) const {
-  return Forward(__pImpl, kAudioVolumePrivilege, &Impl::GetVolumeRange, SOUND_TYPE_MEDIA, min, max);
+  return Forward<&Impl::GetVolumeRange>(__pImpl, kAudioVolumePrivilege, SOUND_TYPE_MEDIA, min, max);
 }
 
 result AudioVolumeManager::GetCallVolumeRange(int& min, int& max) const {
-  return Forward(__pImpl, kAudioVolumePrivilege, &Impl::GetVolumeRange, SOUND_TYPE_CALL, min, max);
+  return Forward<&Impl::GetVolumeRange>(__pImpl, kAudioVolumePrivilege, SOUND_TYPE_CALL, min, max);
 }
 
 result AudioVolumeManager::SetSystemVolumeLevel(int level) {
-  return Forward(__pImpl, kAudioVolumePrivilege, &Impl::SetVolumeLevel, SOUND_TYPE_SYSTEM, level);
+  return Forward<&Impl::SetVolumeLevel>(__pImpl, kAudioVolumePrivilege, SOUND_TYPE_SYSTEM, level);
 }
 
 result AudioVolumeManager::SetNotificationVolumeLevel(int level) {
-  return Forward(__pImpl, kAudioVolumePrivilege, &Impl::SetVolumeLevel, SOUND_TYPE_NOTIFICATION,
-                 level);
+  return Forward<&Impl::SetVolumeLevel>(__pImpl, kAudioVolumePrivilege, SOUND_TYPE_NOTIFICATION,
+                                        level);
 }
 
 result AudioVolumeManager::SetAlarmVolumeLevel(int level) {
-  return Forward(__pImpl, kAudioVolumePrivilege, &Impl::SetVolumeLevel, SOUND_TYPE_ALARM, level);
+  return Forward<&Impl::SetVolumeLevel>(__pImpl, kAudioVolumePrivilege, SOUND_TYPE_ALARM, level);
 }
 
 result AudioVolumeManager::SetRingtoneVolumeLevel(int level) {
-  return Forward(__pImpl, kAudioVolumePrivilege, &Impl::SetVolumeLevel, SOUND_TYPE_RINGTONE, level);
+  return Forward<&Impl::SetVolumeLevel>(__pImpl, kAudioVolumePrivilege, SOUND_TYPE_RINGTONE, level);
 }
 
 result AudioVolumeManager::SetMediaVolumeLevel(int level) {
-  return Forward(__pImpl, kAudioVolumePrivilege, &Impl::SetVolumeLevel, SOUND_TYPE_MEDIA, level);
+  return Forward<&Impl::SetVolumeLevel>(__pImpl, kAudioVolumePrivilege, SOUND_TYPE_MEDIA, level);
 }
 
 result AudioVolumeManager::SetCallVolumeLevel(int level) {
-  return Forward(__pImpl, kAudioVolumePrivilege, &Impl::SetVolumeLevel, SOUND_TYPE_CALL, level);
+  return Forward<&Impl::SetVolumeLevel>(__pImpl, kAudioVolumePrivilege, SOUND_TYPE_CALL, level);
 }
 
 int AudioVolumeManager::GetCurrentSystemVolumeLevel() const {
-  return Forward(__pImpl, kAudioVolumePrivilege, &Impl::GetCurrentVolumeLevel, SOUND_TYPE_SYSTEM);
+  return Forward<&Impl::GetCurrentVolumeLevel>(__pImpl, kAudioVolumePrivilege, SOUND_TYPE_SYSTEM);
 }
 
 int AudioVolumeManager::GetCurrentNotificationVolumeLevel() const {
-  return Forward(__pImpl, kAudioVolumePrivilege, &Impl::GetCurrentVolumeLevel,
-                 SOUND_TYPE_NOTIFICATION);
+  return Forward<&Impl::GetCurrentVolumeLevel>(__pImpl, kAudioVolumePrivilege,
+                                               SOUND_TYPE_NOTIFICATION);
 }
 
 int AudioVolumeManager::GetCurrentAlarmVolumeLevel() const {
-  return Forward(__pImpl, kAudioVolumePrivilege, &Impl::GetCurrentVolumeLevel, SOUND_TYPE_ALARM);
+  return Forward<&Impl::GetCurrentVolumeLevel>(__pImpl, kAudioVolumePrivilege, SOUND_TYPE_ALARM);
 }
 
 int AudioVolumeManager::GetCurrentRingtoneVolumeLevel() const {
-  return Forward(__pImpl, kAudioVolumePrivilege, &Impl::GetCurrentVolumeLevel, SOUND_TYPE_RINGTONE);
+  return Forward<&Impl::GetCurrentVolumeLevel>(__pImpl, kAudioVolumePrivilege, SOUND_TYPE_RINGTONE);
 }
 
 int AudioVolumeManager::GetCurrentMediaVolumeLevel() const {
-  return Forward(__pImpl, kAudioVolumePrivilege, &Impl::GetCurrentVolumeLevel, SOUND_TYPE_MEDIA);
+  return Forward<&Impl::GetCurrentVolumeLevel>(__pImpl, kAudioVolumePrivilege, SOUND_TYPE_MEDIA);
 }
 
 int AudioVolumeManager::GetCurrentCallVolumeLevel() const {
-  return Forward(__pImpl, kAudioVolumePrivilege, &Impl::GetCurrentVolumeLevel, SOUND_TYPE_CALL);
+  return Forward<&Impl::GetCurrentVolumeLevel>(__pImpl, kAudioVolumePrivilege, SOUND_TYPE_CALL);
 }
 
 result AudioVolumeManager::MuteAll() {
-  return Forward(__pImpl, kAudioVolumePrivilege, &Impl::MuteAll);
+  return Forward<&Impl::MuteAll>(__pImpl, kAudioVolumePrivilege);
 }
 
 result AudioVolumeManager::UnmuteAll() {
-  return Forward(__pImpl, kAudioVolumePrivilege, &Impl::UnmuteAll);
+  return Forward<&Impl::UnmuteAll>(__pImpl, kAudioVolumePrivilege);
 }
 
 AudioMuteStatus AudioVolumeManager::GetMuteStatus() const {
-  return Forward(__pImpl, kAudioVolumePrivilege, &Impl::GetMuteStatus);
+  return Forward<&Impl::GetMuteStatus>(__pImpl, kAudioVolumePrivilege);
 }
 
 result AudioVolumeManager::AddAudioVolumeEventListener(IAudioVolumeEventListener& listener) {
-  return Forward(__pImpl, kAudioVolumePrivilege, &Impl::AddAudioVolumeEventListener, listener);
+  return Forward<&Impl::AddAudioVolumeEventListener>(__pImpl, kAudioVolumePrivilege, listener);
 }
 
 result AudioVolumeManager::RemoveAudioVolumeEventListener(IAudioVolumeEventListener& listener) {
-  return Forward(__pImpl, kAudioVolumePrivilege, &Impl::RemoveAudioVolumeEventListener, listener);
+  return Forward<&Impl::RemoveAudioVolumeEventListener>(__pImpl, kAudioVolumePrivilege, listener);
 }
 
 }  // namespace Zelkora::Media

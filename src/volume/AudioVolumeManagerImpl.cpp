@@ -3,8 +3,9 @@
 #include "AudioVolumeEvent.h"
 #include "AudioVolumeEventArg.h"
 #include "SoundType.h"
-#include "frame/Log.h"
-#include "frame/SoundManagerError.h"
+#include "base/Log.h"
+#include "base/Native.h"
+#include "base/SoundManagerError.h"
 
 #include <Zelkora/Media/IAudioVolumeEventListener.h>
 #include <sound_manager.h>
@@ -20,13 +21,12 @@ result FailSoundManager(int error, Format failure) {
 }
 
 /// Converts a sound manager's answer, logging a failure under the name of its function.
-inline result Convert(int error, Format failure) {
+inline result Check(int error, Format failure) {
   return error == 0 ? E_SUCCESS : FailSoundManager(error, failure);
 }
 
 result SetMuteAll(bool muteAll) {
-  return Convert(sound_manager_set_muteall(muteAll),
-                 "[%s] sound_manager_set_muteall failed with %d");
+  return Check(sound_manager_set_muteall(muteAll), "[%s] sound_manager_set_muteall failed with %d");
 }
 
 AudioMuteStatus ToMuteStatus(bool muteAll) {
@@ -62,7 +62,11 @@ result _AudioVolumeManagerImpl::Construct() {
   const result r = __pAudioSessionEvent->Construct();
   if (r != E_SUCCESS) return Propagate(r);
 
-  int error = sound_manager_set_volume_changed_cb(VolumeChangedCallback, this);
+  int error = sound_manager_set_volume_changed_cb(
+      [](auto type, auto volume, void* userData) {
+        VolumeChangedCallback(static_cast<int>(type), static_cast<int>(volume), userData);
+      },
+      this);
   if (error != 0) {
     return Fail(E_SYSTEM,
                 "[E_SYSTEM] A system error has been occurred. Failed to perform "
@@ -88,19 +92,19 @@ _AudioVolumeManagerImpl::~_AudioVolumeManagerImpl() {
 
 result _AudioVolumeManagerImpl::GetVolumeRange(int type, int& min, int& max) const {
   min = 0;
-  return Convert(sound_manager_get_max_volume(type, &max),
-                 "[%s] sound_manager_get_max_volume failed with %d");
+  return Check(CallNative(sound_manager_get_max_volume, type, &max),
+               "[%s] sound_manager_get_max_volume failed with %d");
 }
 
 result _AudioVolumeManagerImpl::SetVolumeLevel(int type, int level) {
-  return Convert(sound_manager_set_volume(type, level),
-                 "[%s] sound_manager_set_volume failed with %d");
+  return Check(CallNative(sound_manager_set_volume, type, level),
+               "[%s] sound_manager_set_volume failed with %d");
 }
 
 int _AudioVolumeManagerImpl::GetCurrentVolumeLevel(int type) const {
   int level = 0;
-  const result r = Convert(sound_manager_get_volume(type, &level),
-                           "[%s] sound_manager_get_volume failed with %d");
+  const result r = Check(CallNative(sound_manager_get_volume, type, &level),
+                         "[%s] sound_manager_get_volume failed with %d");
   return r == E_SUCCESS ? level : -1;
 }
 
@@ -111,7 +115,7 @@ result _AudioVolumeManagerImpl::UnmuteAll() { return SetMuteAll(false); }
 AudioMuteStatus _AudioVolumeManagerImpl::GetMuteStatus() const {
   bool muteAll = false;
   const result r =
-      Convert(sound_manager_get_muteall(&muteAll), "[%s] sound_manager_get_muteall failed with %d");
+      Check(sound_manager_get_muteall(&muteAll), "[%s] sound_manager_get_muteall failed with %d");
   return r == E_SUCCESS ? ToMuteStatus(muteAll) : static_cast<AudioMuteStatus>(0);
 }
 

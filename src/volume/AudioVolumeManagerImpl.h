@@ -4,10 +4,6 @@
 #include <Tizen/Base/Object.h>
 #include <Zelkora/Media/AudioVolumeManager.h>
 
-namespace Tizen::Base::Runtime {
-class IEventArg;
-}
-
 namespace Zelkora::Media {
 
 class IAudioVolumeEventListener;

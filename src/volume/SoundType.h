@@ -3,7 +3,7 @@
 
 namespace Zelkora::Media {
 
-/// The platform's numbers of the six sound categories.
+/// The platform's numbers of the sound categories, without a gap.
 enum _SoundType : int {
   SOUND_TYPE_SYSTEM = 0,
   SOUND_TYPE_NOTIFICATION = 1,
@@ -11,8 +11,9 @@ enum _SoundType : int {
   SOUND_TYPE_RINGTONE = 3,
   SOUND_TYPE_MEDIA = 4,
   SOUND_TYPE_CALL = 5,
+  SOUND_TYPE_END
 };
 
-inline constexpr int kSoundTypeCount = 6;
+inline constexpr int kSoundTypeCount = SOUND_TYPE_END;
 
 }  // namespace Zelkora::Media

@@ -92,21 +92,26 @@ class ZELKORA_MEDIA_API AudioEffector : public Tizen::Base::Object {
   /// reported by an assertion.
   ///
   /// \param player a constructed player; a file need not be open yet
-  /// \return what is then also the last result, on success too, except where assertions return:
+  /// \return what is then also the last result, on success too:
   /// - `E_SUCCESS`
-  /// - `E_UNSUPPORTED_OPERATION` when the device lacks the feature, or the player supports no effect
-  ///   and no preset; a list that can't be had counts as empty
+  /// - `E_UNSUPPORTED_OPERATION` when the device lacks the feature
+  /// - `E_UNSUPPORTED_OPERATION` when the player supports no effect and no preset; a list that
+  ///   can't be had counts as empty
   /// - another code of the feature's lookup when that fails, unchanged
   /// - `E_OUT_OF_MEMORY` for want of memory, and when the player was never constructed
-  /// - `E_INVALID_STATE` when the player has no native handle; and, with the last result untouched,
-  ///   when the effector is constructed already; both where assertions return
+  /// - `E_INVALID_STATE` where assertions return: when the player has no native handle; when the
+  ///   effector is constructed already, which leaves the last result as it was
   result Construct(Tizen::Media::Player& player);
 
-  /// \return a new list of the effects that the player supports, in the player's order, possibly
-  /// empty; the caller deletes it. Null on failure, with the last result `E_OUT_OF_MEMORY` or the
-  /// player's refusal. Success leaves the last result as it was, unless the player reports an
-  /// effect that isn't known here: that is left out, logged, and makes the last result
-  /// `E_INVALID_ARG`. An entry for which memory is short is left out and logged, no more.
+  /// Lists the effects that the player supports, in the player's order.
+  ///
+  /// Success leaves the last result as it was, unless the player reports an effect that isn't known
+  /// here: that is left out, logged, and makes the last result `E_INVALID_ARG`. An entry for which
+  /// memory is short is left out and logged, no more.
+  ///
+  /// \return a new list, possibly empty, which the caller deletes; or null, with the last result
+  /// - `E_OUT_OF_MEMORY`
+  /// - the player's refusal
   Tizen::Base::Collection::IListT<AudioEffectType>* GetSupportedEffectListN() const;
 
   /// The same for presets.
@@ -115,13 +120,15 @@ class ZELKORA_MEDIA_API AudioEffector : public Tizen::Base::Object {
   /// Sets an effect's level.
   /// \param type the effect
   /// \param level the level, handed to the player unchanged, which judges it
-  /// \return what is then also the last result: `E_SUCCESS`; `E_INVALID_ARG` for an unknown effect;
-  /// the player's refusal
+  /// \return what is then also the last result:
+  /// - `E_SUCCESS`
+  /// - `E_INVALID_ARG` for an unknown effect
+  /// - the player's refusal
   result SetEffectLevel(AudioEffectType type, int level);
 
   /// Reads an effect's level.
   /// \param type the effect
-  /// \param level receives the level; untouched for an unknown effect, and after the player's refusal
+  /// \param level receives the level; untouched for an unknown effect; after the player's refusal
   /// what the player left in it
   /// \return as of `SetEffectLevel`
   result GetEffectLevel(AudioEffectType type, int& level) const;
@@ -135,14 +142,18 @@ class ZELKORA_MEDIA_API AudioEffector : public Tizen::Base::Object {
 
   /// Puts every effect back to its default, then selects `AUDIO_EFFECT_PRESET_NORMAL`. The first
   /// step that fails ends it; what was put back before stays so.
-  /// \return `E_SUCCESS`; `E_INVALID_ARG`, then also the last result, when an effect can't be put
-  /// back, whatever the player's reason; the player's refusal when the preset can't be selected,
-  /// which isn't logged, with `E_SUCCESS` as the last result
+  /// \return
+  /// - `E_SUCCESS`, which is also the last result
+  /// - `E_INVALID_ARG`, also the last result, when an effect can't be put back, whatever the reason
+  /// - the player's refusal when the preset can't be selected, which isn't logged; the last result
+  ///   is `E_SUCCESS`
   result ResetAllToDefault();
 
   /// Selects a preset.
-  /// \return what is then also the last result: `E_SUCCESS`; `E_INVALID_ARG` for an unknown preset;
-  /// the player's refusal
+  /// \return what is then also the last result:
+  /// - `E_SUCCESS`
+  /// - `E_INVALID_ARG` for an unknown preset
+  /// - the player's refusal
   result SetEffectPreset(AudioEffectPreset preset);
 
  private:

@@ -23,8 +23,11 @@ enum AudioMuteStatus : int {
 /// Reads and sets the device's volumes, mutes all sound, and reports changes to listeners.
 ///
 /// There is one manager a process. It keeps no state: every answer comes from the device at the
-/// time of the call. The device must have the feature "/tizen/feature/audio_manager", and the
-/// application needs the privilege "/tizen/privilege/audiomanager.volume" at every call.
+/// time of the call.
+///
+/// Needs
+/// - the device's feature "/tizen/feature/audio_manager", at every `GetInstance`;
+/// - the privilege "/tizen/privilege/audiomanager.volume", at every call.
 ///
 /// \code
 /// AudioVolumeManager* volume = AudioVolumeManager::GetInstance();
@@ -36,27 +39,29 @@ enum AudioMuteStatus : int {
 ///
 /// Results that every operation can have:
 /// - `E_PRIVILEGE_DENIED`, or -1 from those that return a value: the application lacks the
-/// privilege;
-///   nothing was done
+///   privilege, and nothing was done
 /// - `E_OUT_OF_MEMORY`, `E_INVALID_ARG`, `E_INVALID_OPERATION`, `E_SYSTEM`, or the value that the
 ///   operation names: the device's refusal
 ///
 /// Each failure is logged and becomes the last result. Success leaves the last result alone, so it
 /// tells something only after a failure.
 ///
-/// Threads: every operation may be called on any thread, and several at once. No call may come
-/// after the process has begun to run its exit handlers: the manager is deleted there.
+/// Threads: every operation may be called on any thread, and several at once.
+///
+/// At exit the manager is deleted by an exit handler. A call that comes after that, and a thread
+/// that is inside an operation then, is the application's error.
 class ZELKORA_MEDIA_API AudioVolumeManager : public Tizen::Base::Object {
  public:
-  /// \return the one manager, created by the first call that passes the privilege and the feature
-  /// test, which are made at every call; never delete it. Null on failure, with the cause in the
-  /// last result, which is `E_SUCCESS` otherwise:
+  /// Gives the one manager. The first call that passes both tests, which are made at every call,
+  /// creates it; never delete it.
+  ///
+  /// \return the manager, with `E_SUCCESS` in the last result; or null, with the cause there:
   /// - `E_PRIVILEGE_DENIED`
   /// - `E_UNSUPPORTED_OPERATION` when the device lacks the feature, or the code of a failing lookup
-  /// - `E_OUT_OF_MEMORY`, `E_SYSTEM`, or the code with which the platform's events refuse to start,
-  ///   when the manager couldn't be made. That is tried once in the life of a process: later calls,
-  ///   and the first ones of other threads, give null with `E_SUCCESS` in the last result. So do
-  ///   calls after the manager was deleted at exit.
+  /// - `E_OUT_OF_MEMORY`, `E_SYSTEM` when a callback can't be registered, or the code with which
+  ///   the platform's events refuse to start: the manager couldn't be made
+  /// - `E_SUCCESS` after that, because it is tried once in the life of a process, on another thread
+  ///   too; and when the manager has been deleted at exit
   static AudioVolumeManager* GetInstance();
 
   /// \name Volume ranges
@@ -73,8 +78,9 @@ class ZELKORA_MEDIA_API AudioVolumeManager : public Tizen::Base::Object {
   /// @}
 
   /// \name Setting levels
-  /// \param level the new level, handed to the device unchanged, which judges it
-  /// \return `E_SUCCESS` or a code of the class's list; `E_INVALID_ARG` for a level out of range
+  /// \param level the new level, handed to the device unchanged, which judges it: the host
+  /// platform's devices answer `E_INVALID_ARG` to one out of range
+  /// \return `E_SUCCESS` or a code of the class's list
   /// @{
   result SetSystemVolumeLevel(int level);
   result SetNotificationVolumeLevel(int level);
@@ -95,31 +101,42 @@ class ZELKORA_MEDIA_API AudioVolumeManager : public Tizen::Base::Object {
   int GetCurrentCallVolumeLevel() const;
   /// @}
 
-  /// Mutes all sound; levels stay as they are. \return `E_SUCCESS` or a code of the class's list
+  /// Mutes all sound; levels stay as they are.
+  /// \return `E_SUCCESS` or a code of the class's list
   result MuteAll();
 
-  /// Ends `MuteAll`. \return `E_SUCCESS` or a code of the class's list
+  /// Ends `MuteAll`.
+  /// \return `E_SUCCESS` or a code of the class's list
   result UnmuteAll();
 
-  /// \return whether all sound is muted; on failure a value outside the enumeration: 0 when the
-  /// device refuses the query, -1 when the privilege is denied
+  /// Tells whether all sound is muted.
+  ///
+  /// \return
+  /// - `AUDIO_MUTE_STATUS_MUTED` or `AUDIO_MUTE_STATUS_UNMUTED`
+  /// - 0, a value outside the enumeration, when the device refuses the query
+  /// - -1, likewise outside, when the privilege is denied
   AudioMuteStatus GetMuteStatus() const;
 
-  /// Adds a listener, which hears every change from now on until it is removed: from this
-  /// application and from outside. Listeners are called one after the other on a thread of the
-  /// platform's, never inside `SetMediaVolumeLevel` and its like.
+  /// Adds a listener, which hears every change from now on until it is removed: those that this
+  /// application makes and those from outside. No listener is called inside `SetMediaVolumeLevel`
+  /// and its like.
   ///
   /// \param listener the listener; it stays the application's and must live until it is removed
-  /// \return `E_SUCCESS`, a code of the class's list, or the platform's own refusal, which isn't
-  /// logged and doesn't become the last result: on the host platform `E_INVALID_OPERATION` when the
-  /// listener is added already
+  /// \return
+  /// - `E_SUCCESS`
+  /// - `E_PRIVILEGE_DENIED`
+  /// - the platform's refusal, which isn't logged and doesn't become the last result: on the host
+  ///   platform `E_INVALID_OPERATION` when the listener is added already, or `E_OUT_OF_MEMORY`
   result AddAudioVolumeEventListener(IAudioVolumeEventListener& listener);
 
   /// Removes a listener. On the host platform no call of it is running when this returns, unless it
   /// is called from inside one.
   ///
-  /// \return as of `AddAudioVolumeEventListener`; on the host platform `E_OBJ_NOT_FOUND` when the
-  /// listener isn't added
+  /// \return
+  /// - `E_SUCCESS`
+  /// - `E_PRIVILEGE_DENIED`
+  /// - the platform's refusal, which isn't logged and doesn't become the last result: on the host
+  ///   platform `E_OBJ_NOT_FOUND` when the listener isn't added
   result RemoveAudioVolumeEventListener(IAudioVolumeEventListener& listener);
 
  private:

@@ -9,14 +9,15 @@ namespace Zelkora::Media {
 
 /// Hears about changes of volumes and of the mute status. Override what you want to hear.
 ///
-/// The application owns its listener and keeps it alive while it is added to the
-/// `AudioVolumeManager`. All calls come on a thread of the platform's, one after the other, in the
-/// order of the changes; on the host platform that is one thread for all events of the process, so
-/// a call that takes long delays the others. A call may use the manager, also to add and remove
-/// listeners. An exception that leaves a call is logged and ends there on the host platform; a
-/// device needn't be so patient.
+/// Calls
+/// - come on a thread of the platform's, one after the other, in the order of the changes;
+/// - may use the manager, also to add and remove listeners, this one included;
+/// - must not wait for another event: on the host platform one thread tells all events of the
+///   process, so a call that takes long delays the others;
+/// - must not let an exception out: the host platform logs it and goes on, a device may not.
 ///
-/// Levels are those of `AudioVolumeManager`, at the time of the change.
+/// The application owns its listener and keeps it alive until it is removed from the
+/// `AudioVolumeManager`. Levels are those of the manager, at the time of the change.
 class ZELKORA_MEDIA_API IAudioVolumeEventListener
     : virtual public Tizen::Base::Runtime::IEventListener {
  public:
@@ -29,8 +30,9 @@ class ZELKORA_MEDIA_API IAudioVolumeEventListener
   virtual void OnMediaVolumeChanged(int level) { (void)level; }
   virtual void OnCallVolumeChanged(int level) { (void)level; }
 
-  /// All sound was muted or unmuted. Called right after `OnMuteAllStatusChanged`, with the same
-  /// status: override one of the two.
+  /// All sound was muted or unmuted.
+  ///
+  /// Called right after `OnMuteAllStatusChanged`, with the same status: override one of the two.
   virtual void OnMuteStatusChanged(AudioMuteStatus status) { (void)status; }
 
   /// All sound was muted or unmuted.

@@ -59,10 +59,19 @@ class ZELKORA_MEDIA_API VideoKeyFrameSeeker : public Tizen::Base::Object {
   /// The position goes to the player unchanged; which key frame is near and what positions are
   /// outside the media is the player's to judge.
   ///
+  /// On the host platform it is the last key frame at or before the position, or the first one of
+  /// the file. A position means its whole millisecond: a key frame at 1999.6 ms counts for 1999.
+  /// The first seek in a file may have to read all of it, for at most five seconds.
+  ///
   /// \param msTime the position to move to, in milliseconds from the start
   /// \return `E_SUCCESS`, which leaves the last result as it was; `E_INVALID_STATE` when the seeker
   /// is not constructed, where assertions return, which leaves it too; else the player's code,
-  /// unchanged, which is then also the last result
+  /// unchanged, which is then also the last result. The host platform's player gives:
+  /// - `E_INVALID_STATE` when no file is open
+  /// - `E_INVALID_ARG` for a position below 0 or above the file's length
+  /// - `E_INVALID_OPERATION` when the file has no video, or can't be sought in
+  /// - `E_OUT_OF_MEMORY`
+  /// - `E_SYSTEM` when there is no intact key frame, or the media framework fails or doesn't answer
   result SeekTo(long msTime);
 
  private:

@@ -28,10 +28,12 @@ enum VoipAudioSessionMode : int {
 
 /// Opens a call session for a voice-over-IP call, switches its mode and closes it.
 ///
-/// There is one manager a process, and one call session at a time. The device must have the feature
-/// "/tizen/feature/audio_manager", and the application needs the privilege
-/// "/tizen/privilege/audiomanager.voipsession" at every call. A session that is open at process
-/// exit is closed there.
+/// There is one manager a process, and one call session at a time. A session that is open at
+/// process exit is closed there.
+///
+/// Needs
+/// - the device's feature "/tizen/feature/audio_manager", at every `GetInstance`;
+/// - the privilege "/tizen/privilege/audiomanager.voipsession", at every call.
 ///
 /// \code
 /// VoipAudioSessionManager* call = VoipAudioSessionManager::GetInstance();
@@ -46,40 +48,58 @@ enum VoipAudioSessionMode : int {
 /// "the device's refusal" is named, it is one of `E_OUT_OF_MEMORY`, `E_INVALID_ARG`,
 /// `E_INVALID_OPERATION` and `E_SYSTEM`.
 ///
-/// Threads: every operation may be called on any thread, but calls must not overlap. No call may
-/// come after the process has begun to run its exit handlers: the manager is deleted there.
+/// Threads: every operation may be called on any thread, but calls must not overlap.
+///
+/// At exit the manager is deleted by an exit handler. A call that comes after that, and a thread
+/// that is inside an operation then, is the application's error.
 class ZELKORA_MEDIA_API VoipAudioSessionManager : public Tizen::Base::Object {
  public:
-  /// \return the one manager, created by the first call that passes the privilege and the feature
-  /// test, which are made at every call; never delete it. Null on failure, with the cause in the
-  /// last result, which is `E_SUCCESS` otherwise:
+  /// Gives the one manager. The first call that passes both tests, which are made at every call,
+  /// creates it; never delete it.
+  ///
+  /// \return the manager, with `E_SUCCESS` in the last result; or null, with the cause there:
   /// - `E_PRIVILEGE_DENIED`
   /// - `E_UNSUPPORTED_OPERATION` when the device lacks the feature, or the code of a failing lookup
-  /// - `E_OUT_OF_MEMORY` when the manager couldn't be made. That is tried once in the life of a
-  ///   process: later calls, and the first ones of other threads, give null with `E_SUCCESS` in the
-  ///   last result. So do calls after the manager was deleted at exit.
+  /// - `E_OUT_OF_MEMORY` when the manager couldn't be made
+  /// - `E_SUCCESS` after that, because it is tried once in the life of a process, on another thread
+  ///   too; and when the manager has been deleted at exit
   static VoipAudioSessionManager* GetInstance();
 
   /// Opens the call session.
-  /// \return `E_SUCCESS`; `E_PRIVILEGE_DENIED`; `E_INVALID_OPERATION` when it is open already,
-  /// which it stays; `E_SYSTEM` when the device gives no session; the device's refusal
+  /// \return
+  /// - `E_SUCCESS`
+  /// - `E_PRIVILEGE_DENIED`
+  /// - `E_INVALID_OPERATION` when it is open already, which it stays
+  /// - `E_SYSTEM` when the device gives no session
+  /// - the device's refusal
   result EnterCallSession();
 
   /// Closes the call session.
-  /// \return `E_SUCCESS`; `E_PRIVILEGE_DENIED`; `E_INVALID_OPERATION` when none is open; the
-  /// device's refusal, after which the session is still open: call again
+  /// \return
+  /// - `E_SUCCESS`
+  /// - `E_PRIVILEGE_DENIED`
+  /// - `E_INVALID_OPERATION` when none is open
+  /// - the device's refusal, after which the session is still open: call again
   result ExitCallSession();
 
   /// Switches the open session's mode.
   /// \param mode one of the enumeration's values
-  /// \return `E_SUCCESS`; `E_PRIVILEGE_DENIED`; `E_INVALID_STATE` when no session is open;
-  /// `E_INVALID_ARG` for another value; the device's refusal
+  /// \return
+  /// - `E_SUCCESS`
+  /// - `E_PRIVILEGE_DENIED`
+  /// - `E_INVALID_STATE` when no session is open
+  /// - `E_INVALID_ARG` for another value
+  /// - the device's refusal
   result SetCallSessionMode(VoipAudioSessionMode mode);
 
-  /// \return the open session's mode; `VOIP_AUDIO_SESSION_MODE_NONE` when no session is open
-  /// (`E_INVALID_STATE`), the device refuses the query (its refusal), or it reports a mode that
-  /// isn't known (the last result as it was); -1, a value outside the enumeration, when the
-  /// privilege is denied
+  /// Reads the open session's mode.
+  ///
+  /// \return
+  /// - the mode
+  /// - `VOIP_AUDIO_SESSION_MODE_NONE` when no session is open: the last result is `E_INVALID_STATE`
+  /// - the same when the device refuses the query: the last result is its refusal
+  /// - the same when it reports a mode that isn't known: the last result is as it was
+  /// - -1, a value outside the enumeration, when the privilege is denied
   VoipAudioSessionMode GetCallSessionMode() const;
 
  private:

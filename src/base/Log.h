@@ -18,22 +18,19 @@ inline constexpr char kLogTag[] = "ZELKORA_MEDIA";
 /// The platform family names no function.
 inline constexpr char kNoFunction[] = "";
 
-/// A format text together with the line it stands on.
-struct Format {
-  Format(const char* format, int callerLine = __builtin_LINE()) : text(format), line(callerLine) {}
+/// A text together with the line of whoever gives it.
+template <typename Character>
+struct Placed {
+  Placed(const Character* givenText, int givenLine = __builtin_LINE())
+      : text(givenText), line(givenLine) {}
 
-  const char* text;
+  const Character* text;
   int line;
 };
 
-/// The same for the application family, whose lines also carry the signature of the function.
-struct Place {
-  Place(const char* signature, int callerLine = __builtin_LINE())
-      : function(signature), line(callerLine) {}
-
-  const char* function;
-  int line;
-};
+using Format = Placed<char>;     ///< a message's printf-style text
+using Signature = Placed<char>;  ///< a function's: `__PRETTY_FUNCTION__`
+using Key = Placed<wchar_t>;     ///< a feature's or a privilege's
 
 /// Reports a failure through the platform family, which makes \p r the last result.
 /// \return r
@@ -55,12 +52,11 @@ void LogDiagnostic(Format format, Arguments... arguments) {
 }
 
 /// Reports a failure through the application family and makes \p r the last result.
-/// \param place the function's signature: `__PRETTY_FUNCTION__`
 /// \return r
 template <typename... Arguments>
-result FailTagged(result r, Place place, const char* format, Arguments... arguments) {
+result FailTagged(result r, Signature caller, const char* format, Arguments... arguments) {
   SetLastResult(r);
-  AppLogExceptionTagInternal(kLogTag, place.function, place.line, format, arguments...);
+  AppLogExceptionTagInternal(kLogTag, caller.text, caller.line, format, arguments...);
   return r;
 }
 

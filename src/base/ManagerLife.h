@@ -20,23 +20,23 @@ inline constexpr char kObjectNotCreated[] =
     "[E_OUT_OF_MEMORY] Memory allocation failed.  The object is not created.";
 
 /// The life of a manager: once a process, from the first `GetInstance` that passes both gates to
-/// process exit. A manager is a friend's business: it has private statics `__pInstance`,
-/// `__onceBlock`, `InitSingleton` and `DestroySingleton`, a private `Construct`, and `__pImpl`.
+/// process exit. A manager's class makes this one its friend and declares, all private: the statics
+/// `__pInstance`, `__onceBlock`, `InitSingleton` and `DestroySingleton`, `Construct` and `__pImpl`.
 class _ManagerLife {
  public:
   _ManagerLife() = delete;
 
   template <typename Manager>
-  static Manager* GetInstance(const wchar_t* privilege, Place place) {
+  static Manager* GetInstance(const wchar_t* privilege, Signature caller) {
     ClearLastResult();
-    if (CheckPrivilege(privilege, place.line) != E_SUCCESS) return nullptr;
-    if (CheckFeature(kAudioManagerFeature, place) != E_SUCCESS) return nullptr;
+    if (CheckPrivilege({privilege, caller.line}) != E_SUCCESS) return nullptr;
+    if (CheckFeature(kAudioManagerFeature, caller) != E_SUCCESS) return nullptr;
     if (Manager* pInstance = Published<Manager>()) return pInstance;
 
     pthread_once(&Manager::__onceBlock, Manager::InitSingleton);
     const result r = GetLastResult();
     if (Manager* pInstance = Published<Manager>()) return pInstance;
-    Propagate(r, place.line);
+    Propagate(r, caller.line);
     return nullptr;
   }
 

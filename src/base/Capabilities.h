@@ -26,10 +26,10 @@ inline constexpr wchar_t kAudioVolumePrivilege[] =
 #undef ZELKORA_KEY_HOST
 
 /// Feature gate: asks the platform whether the device offers a feature.
-/// \param place the guarded operation's signature
+/// \param caller the guarded operation's signature
 /// \return `E_SUCCESS`, or the refusal, then logged and the last result: `E_UNSUPPORTED_OPERATION`
 /// when the feature is absent or unknown, else the lookup's own failure
-result CheckFeature(const wchar_t* key, Place place);
+result CheckFeature(const wchar_t* key, Signature caller);
 
 /// \return whether the application holds a privilege.
 bool HasPrivilege(const wchar_t* key);
@@ -40,8 +40,8 @@ result FailPrivilege(int line);
 /// Privilege gate: asks the platform whether the application holds a privilege.
 /// \return `E_SUCCESS`, or `E_PRIVILEGE_DENIED`, then logged and the last result, whatever the
 /// platform answered
-inline result CheckPrivilege(const wchar_t* key, int line = __builtin_LINE()) {
-  return HasPrivilege(key) ? E_SUCCESS : FailPrivilege(line);
+inline result CheckPrivilege(Key privilege) {
+  return HasPrivilege(privilege.text) ? E_SUCCESS : FailPrivilege(privilege.line);
 }
 
 }  // namespace Zelkora::Media

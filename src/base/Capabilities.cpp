@@ -17,10 +17,10 @@ result QueryFeature(const wchar_t* key) {
 
 }  // namespace
 
-result CheckFeature(const wchar_t* key, Place place) {
+result CheckFeature(const wchar_t* key, Signature caller) {
   const result r = QueryFeature(key);
   if (r == E_SUCCESS) return E_SUCCESS;
-  return FailTagged(r, place, "[%s] Propagating.", GetErrorMessage(r));
+  return FailTagged(r, caller, "[%s] Propagating.", GetErrorMessage(r));
 }
 
 bool HasPrivilege(const wchar_t* key) {

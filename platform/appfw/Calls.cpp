@@ -1,9 +1,10 @@
+#include "Global.h"
+
 #include <Host/Calls.h>
 
 #include <cstdarg>
 #include <cstdio>
 #include <list>
-#include <mutex>
 #include <new>
 #include <utility>
 
@@ -17,7 +18,6 @@ struct Failure {
 };
 
 struct State {
-  std::mutex mutex;
   bool recording = false;
   std::vector<std::string> calls;
   std::list<Failure> failures;
@@ -40,10 +40,9 @@ struct State {
   }
 };
 
-/// Never destroyed: calls are made until the process is gone.
-State& TheState() {
-  static State& state = *new State;
-  return state;
+template <typename Operation>
+auto WithState(Operation operation) {
+  return Global<State>::Use(operation);
 }
 
 }  // namespace
@@ -59,46 +58,44 @@ std::optional<int> OnWatchedCall(const char* function, const char* format, ...) 
   std::vsnprintf(arguments, sizeof arguments, format, list);
   va_end(list);
 
-  State& state = TheState();
-  std::lock_guard lock(state.mutex);
-  if (state.recording) {
-    try {
-      state.calls.push_back(std::string(function) + "(" + arguments + ")");
-    } catch (const std::bad_alloc&) {
-      // The call matters more than its record.
+  return WithState([&](State& state) {
+    if (state.recording) {
+      try {
+        state.calls.push_back(std::string(function) + "(" + arguments + ")");
+      } catch (const std::bad_alloc&) {
+        // The call matters more than its record.
+      }
     }
-  }
-  return state.TakeFailure(function);
+    return state.TakeFailure(function);
+  });
 }
 
 }  // namespace Internal
 
 void RecordCalls(bool on) {
-  State& state = TheState();
-  std::lock_guard lock(state.mutex);
-  if (on) state.calls.clear();
-  state.recording = on;
-  state.UpdateWatched();
+  WithState([=](State& state) {
+    if (on) state.calls.clear();
+    state.recording = on;
+    state.UpdateWatched();
+  });
 }
 
 std::vector<std::string> TakeCalls() {
-  State& state = TheState();
-  std::lock_guard lock(state.mutex);
-  return std::exchange(state.calls, {});
+  return WithState([](State& state) { return std::exchange(state.calls, {}); });
 }
 
 void FailCall(const char* function, int code, unsigned nth) {
-  State& state = TheState();
-  std::lock_guard lock(state.mutex);
-  state.failures.push_back({function, code, nth});
-  state.UpdateWatched();
+  WithState([=](State& state) {
+    state.failures.push_back({function, code, nth});
+    state.UpdateWatched();
+  });
 }
 
 void ClearFailures() {
-  State& state = TheState();
-  std::lock_guard lock(state.mutex);
-  state.failures.clear();
-  state.UpdateWatched();
+  WithState([](State& state) {
+    state.failures.clear();
+    state.UpdateWatched();
+  });
 }
 
 }  // namespace Host

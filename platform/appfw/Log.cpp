@@ -11,6 +11,7 @@
 #include <cstdarg>
 #include <cstdio>
 #include <cstdlib>
+#include <cstring>
 #include <mutex>
 #include <shared_mutex>
 
@@ -47,29 +48,28 @@ void WriteFully(const char* text, std::size_t size) {
   }
 }
 
-/// Appends to one line, in memory of its own, so that threads' lines don't mix.
-class Line {
+/// Appends to a text of limited size.
+class Text {
  public:
+  Text(char* text, std::size_t size) : text_(text), limit_(size) {}
+
   void Append(const char* format, ...) __attribute__((format(printf, 2, 3))) {
     va_list arguments;
     va_start(arguments, format);
-    const int wanted = std::vsnprintf(text_ + size_, sizeof text_ - size_, format, arguments);
+    const int wanted = std::vsnprintf(text_ + size_, limit_ - size_, format, arguments);
     va_end(arguments);
-    if (wanted > 0) size_ = std::min(size_ + static_cast<std::size_t>(wanted), sizeof text_ - 1);
-  }
-
-  void Write() {
-    text_[std::min(size_, sizeof text_ - 1)] = '\n';
-    WriteFully(text_, std::min(size_ + 1, sizeof text_));
+    if (wanted > 0) size_ = std::min(size_ + static_cast<std::size_t>(wanted), limit_ - 1);
   }
 
  private:
-  char text_[2 * kMessageSize];
+  char* const text_;
+  const std::size_t limit_;
   std::size_t size_ = 0;
 };
 
 const char* NameOf(LogLevel level) {
   switch (level) {
+    case LogLevel::kDebug: return "debug";
     case LogLevel::kInfo: return "info";
     case LogLevel::kError: return "error";
     case LogLevel::kAssertion: return "assertion";
@@ -77,15 +77,20 @@ const char* NameOf(LogLevel level) {
   return "";
 }
 
+bool IsDebugShown() {
+  static const char* const level = std::getenv("ZELKORA_LOG");
+  static const bool isShown = level != nullptr && std::strcmp(level, "debug") == 0;
+  return isShown;
+}
+
+/// In one piece, so that threads' lines don't mix.
 void WriteToStandardError(const LogRecord& record) {
-  Line line;
-  line.Append("zelkora %s", NameOf(record.level));
-  if (record.module != 0) line.Append(" module=%d", record.module);
-  if (record.tag[0] != '\0') line.Append(" tag=%s", record.tag);
-  if (record.hasResult) line.Append(" result=%s", GetErrorMessage(record.code));
-  if (record.function[0] != '\0') line.Append(" function=\"%s\"", record.function);
-  line.Append(" line=%d: %s", record.line, record.message);
-  line.Write();
+  if (record.level == LogLevel::kDebug && !IsDebugShown()) return;
+  char text[2 * kMessageSize];
+  Host::FormatLog(record, text, sizeof text);
+  const std::size_t size = std::strlen(text);
+  text[size] = '\n';
+  WriteFully(text, size + 1);
 }
 
 void Deliver(const LogRecord& record) noexcept {
@@ -125,8 +130,9 @@ LogRecord PlatformRecord(LogLevel level, int module, const char* function, int l
   return {level, module, "", false, E_SUCCESS, function, line, ""};
 }
 
-LogRecord PlatformFailure(int module, result r, const char* function, int line) {
-  return {LogLevel::kError, module, "", true, r, function, line, ""};
+LogRecord PlatformFailure(int module, result r, const char* function, int line,
+                          LogLevel level = LogLevel::kError) {
+  return {level, module, "", true, r, function, line, ""};
 }
 
 LogRecord ApplicationRecord(LogLevel level, const char* tag, const char* function, int line) {
@@ -137,6 +143,16 @@ LogRecord ApplicationRecord(LogLevel level, const char* tag, const char* functio
 
 namespace Host {
 
+void FormatLog(const LogRecord& record, char* text, std::size_t size) noexcept {
+  Text line(text, size);
+  line.Append("zelkora %s", NameOf(record.level));
+  if (record.module != 0) line.Append(" module=%d", record.module);
+  if (record.tag[0] != '\0') line.Append(" tag=%s", record.tag);
+  if (record.hasResult) line.Append(" result=%s", GetErrorMessage(record.code));
+  if (record.function[0] != '\0') line.Append(" function=\"%s\"", record.function);
+  line.Append(" line=%d: %s", record.line, record.message);
+}
+
 void SetLogSink(LogSink newSink, void* context) noexcept {
   std::unique_lock lock(sinkMutex);
   sink = newSink;
@@ -144,8 +160,6 @@ void SetLogSink(LogSink newSink, void* context) noexcept {
 }
 
 void SetAssertionAction(AssertionAction action) noexcept { assertionAction = action; }
-
-AssertionAction GetAssertionAction() noexcept { return assertionAction; }
 
 }  // namespace Host
 
@@ -156,6 +170,10 @@ AssertionAction GetAssertionAction() noexcept { return assertionAction; }
   va_start(arguments, format);                 \
   DeliverFormatted(record, format, arguments); \
   va_end(arguments)
+
+void Host::LogReason(int module, result r, int line, const char* format, ...) noexcept {
+  DELIVER_FORMATTED(PlatformFailure(module, r, "", line, LogLevel::kDebug));
+}
 
 void SysLogExceptionInternal(int module, result r, const char* function, int line,
                              const char* format, ...) noexcept {

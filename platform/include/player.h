@@ -38,8 +38,12 @@ int player_open(player_h player, const char* path);
 /// Closes the file. Succeeds when none is open.
 int player_close(player_h player);
 
+/// Starts or resumes playing; at the end, from the start again.
 int player_play(player_h player);
 int player_pause(player_h player);
+
+/// \param at_end receives whether playing has come to the end of the file, and stands there
+int player_is_at_end(player_h player, bool* at_end);
 
 /// Moves to \p position, or (\p exact false) to a key frame at or before it, and returns when the
 /// new position is known.
@@ -50,6 +54,13 @@ int player_get_duration(player_h player, long* duration);
 
 /// \param key_frame receives whether the last seek showed a key frame
 int player_is_key_frame(player_h player, bool* key_frame);
+
+/// Receives the position of a key frame. \return true to go on, false to stop
+typedef bool (*player_key_frame_cb)(long position, void* user_data);
+
+/// Tells the positions of all key frames, in ascending order, on the calling thread. Reads the whole
+/// file, and takes as long as that needs; closing the player meanwhile ends it with an error.
+int player_foreach_key_frame(player_h player, player_key_frame_cb callback, void* user_data);
 
 /// Receives a picture: rows of three bytes a pixel (red, green, blue), \p stride bytes apart, valid
 /// during the call.

@@ -1,42 +1,62 @@
-// The simulated device's player: media without bytes, and a clock that stands still, so that a
-// position changes only by a seek.
+// The simulated device's player: media without bytes, a clock that stands still, so that a position
+// changes only by a seek, and effects that are kept and not heard.
 
-#include "Player.h"
+#include "appfw/Global.h"
+#include "native/PlayerDevice.h"
+#include "native/PlayerError.h"
 
-#include <Host/Calls.h>
 #include <Simulated/Device.h>
 
 #include <algorithm>
-#include <new>
+#include <memory>
+#include <mutex>
+#include <optional>
+
+using Host::PlayerFailure;
+using Simulated::Effects;
+using Simulated::Media;
+
+struct PlayerDevice::Player {
+  std::shared_ptr<const Media> media;  // null: no file is open
+  long position = 0;
+  bool showsKeyFrame = false;
+  bool isAtEnd = false;
+
+  std::mutex levelsMutex;
+  std::array<std::optional<int>, 5> levels;  // of effects 1 to 5; without a value: the initial one
+};
 
 namespace {
 
-using Simulated::Refuse;
+constexpr int kOk = PLAYER_ERROR_NONE;
 
-std::mutex mediaMutex;
-std::shared_ptr<const Simulated::Media> nextMedia;  // null: the default
-
-std::shared_ptr<const Simulated::Media> NextMedia() {
-  std::lock_guard lock(mediaMutex);
-  if (nextMedia == nullptr) nextMedia = std::make_shared<Simulated::Media>();
-  return nextMedia;
+int Refuse(int error, const char* reason, int line = __builtin_LINE()) {
+  return PlayerFailure(error, line, "%s", reason);
 }
 
-long KeyFrameAtOrBefore(const Simulated::Media& media, long position) {
+int RefuseVideo() { return Refuse(PLAYER_ERROR_INVALID_OPERATION, "the file has no video"); }
+
+/// What is set for all players, and replaced as a whole.
+template <typename Value>
+struct Setting {
+  std::shared_ptr<const Value> value = std::make_shared<const Value>();
+};
+
+template <typename Value>
+std::shared_ptr<const Value> Get() {
+  return Host::Global<Setting<Value>>::Use([](const auto& setting) { return setting.value; });
+}
+
+template <typename Value>
+void Set(const Value& value) {
+  auto changed = std::make_shared<const Value>(value);
+  Host::Global<Setting<Value>>::Use([&](auto& setting) { setting.value.swap(changed); });
+}
+
+long KeyFrameAtOrBefore(const Media& media, long position) {
   if (media.keyFrames.empty()) return position - position % media.keyFrameInterval;
   const auto after = std::upper_bound(media.keyFrames.begin(), media.keyFrames.end(), position);
   return after == media.keyFrames.begin() ? media.keyFrames.front() : *(after - 1);
-}
-
-/// Runs \p operation on a player that has a file open.
-template <typename Operation>
-int WithFile(player_h player, Operation operation, int line = __builtin_LINE()) {
-  if (player == nullptr) return Refuse(PLAYER_ERROR_INVALID_PARAMETER, "the player is null", line);
-  std::lock_guard lock(player->mutex);
-  if (player->media == nullptr) {
-    return Refuse(PLAYER_ERROR_INVALID_STATE, "no file is open", line);
-  }
-  return operation();
 }
 
 /// A picture whose bar and colour tell the position.
@@ -44,11 +64,11 @@ struct Picture {
   static constexpr int kWidth = 320, kHeight = 180, kStride = kWidth * 3;
   std::vector<unsigned char> pixels;
 
-  Picture(long position, long duration) : pixels(kStride * kHeight) {
+  Picture(long position, long duration) : pixels(std::size_t{kStride} * kHeight) {
     const long bar = duration > 0 ? position * kWidth / duration : 0;
+    unsigned char* pixel = pixels.data();
     for (int y = 0; y < kHeight; ++y) {
-      for (int x = 0; x < kWidth; ++x) {
-        unsigned char* pixel = &pixels[static_cast<std::size_t>(y * kStride + x * 3)];
+      for (int x = 0; x < kWidth; ++x, pixel += 3) {
         pixel[0] = static_cast<unsigned char>(position / 50 % 256);
         pixel[1] = static_cast<unsigned char>(y);
         pixel[2] = x <= bar ? 255 : 64;
@@ -57,140 +77,134 @@ struct Picture {
   }
 };
 
+int List(const std::vector<int> Effects::*values, const std::function<bool(int)>& visit) {
+  const auto effects = Get<Effects>();
+  const std::vector<int>& list = (*effects).*values;
+  const bool isWhole = std::all_of(list.begin(), list.end(), visit);
+  if (!isWhole || effects->enumerationError == 0) return kOk;
+  return Refuse(effects->enumerationError, "the enumeration fails");
+}
+
+bool Contains(const std::vector<int>& values, int value) {
+  return std::find(values.begin(), values.end(), value) != values.end();
+}
+
+std::size_t IndexOf(int effect) { return static_cast<std::size_t>(effect) - 1; }
+
 }  // namespace
 
-void player_s::Open(std::shared_ptr<const Simulated::Media> opened) {
-  media = std::move(opened);
-  position = 0;
-  showsKeyFrame = false;
+namespace PlayerDevice {
+
+int Create(Player*& player) { return player = new Player, kOk; }
+
+void Destroy(Player* player) { delete player; }
+
+int Open(Player& player, const char*, const std::atomic<int>&) {
+  player.media = Get<Media>();
+  player.position = 0;
+  player.showsKeyFrame = player.isAtEnd = false;
+  return kOk;
 }
 
-int player_s::Seek(long target, bool exact) {
-  if (!media->hasVideo) {
-    return Refuse(PLAYER_ERROR_INVALID_OPERATION, "the file has no video");
+void Close(Player& player) { player.media = nullptr; }
+
+bool IsOpen(const Player& player) { return player.media != nullptr; }
+
+int Play(Player& player) {
+  if (player.isAtEnd) player.position = 0;
+  player.isAtEnd = player.position == player.media->duration;
+  return kOk;
+}
+
+int Pause(Player&) { return kOk; }
+
+bool IsAtEnd(const Player& player) { return player.isAtEnd; }
+
+int Seek(Player& player, long position, bool isExact) {
+  if (!player.media->hasVideo) return RefuseVideo();
+  if (position < 0 || position > player.media->duration) {
+    return PlayerFailure(PLAYER_ERROR_INVALID_PARAMETER, __LINE__,
+                         "position %ld ms is outside the file, which is %ld ms long", position,
+                         player.media->duration);
   }
-  if (target < 0 || target > media->duration) {
-    return Host::PlayerFailure(PLAYER_ERROR_INVALID_PARAMETER, __LINE__,
-                               "position %ld ms is outside the file, which is %ld ms long", target,
-                               media->duration);
+  const long keyFrame = KeyFrameAtOrBefore(*player.media, position);
+  player.position = isExact ? position : keyFrame;
+  player.showsKeyFrame = player.position == keyFrame;
+  player.isAtEnd = false;
+  return kOk;
+}
+
+int GetPosition(Player& player, long& position) { return position = player.position, kOk; }
+
+int GetDuration(Player& player, long& duration) { return duration = player.media->duration, kOk; }
+
+bool IsKeyFrame(const Player& player) { return player.showsKeyFrame; }
+
+int ListKeyFrames(Player& player, const std::function<bool(long)>& visit) {
+  const Media& media = *player.media;
+  if (!media.hasVideo) return RefuseVideo();
+  if (media.keyFrames.empty()) {
+    for (long at = 0; at <= media.duration && visit(at);) at += media.keyFrameInterval;
+  } else {
+    std::all_of(media.keyFrames.begin(), media.keyFrames.end(), visit);
   }
-  const long keyFrame = KeyFrameAtOrBefore(*media, target);
-  position = exact ? target : keyFrame;
-  showsKeyFrame = position == keyFrame;
-  return PLAYER_ERROR_NONE;
+  return kOk;
 }
 
-extern "C" {
-
-int player_create(player_h* player) {
-  if (auto failure = Host::OnCall("player_create", "%s", "")) return *failure;
-  if (player == nullptr) return Refuse(PLAYER_ERROR_INVALID_PARAMETER, "the player is null");
-  *player = new (std::nothrow) player_s;
-  if (*player == nullptr) return Refuse(PLAYER_ERROR_OUT_OF_MEMORY, "no memory for a player");
-  return PLAYER_ERROR_NONE;
+int CaptureFrame(Player& player, player_frame_cb callback, void* userData) {
+  if (!player.media->hasVideo) return RefuseVideo();
+  const Picture picture(player.position, player.media->duration);
+  callback(picture.pixels.data(), Picture::kWidth, Picture::kHeight, Picture::kStride, userData);
+  return kOk;
 }
 
-int player_destroy(player_h player) {
-  if (auto failure = Host::OnCall("player_destroy", "%s", "")) return *failure;
-  delete player;
-  return PLAYER_ERROR_NONE;
+int RenderAudio(Player&, const char*) {
+  return Refuse(PLAYER_ERROR_INVALID_OPERATION, "a simulated player's sound can't be heard");
 }
 
-int player_open(player_h player, const char* path) try {
-  if (auto failure = Host::OnCall("player_open", "%s", path == nullptr ? "null" : path)) {
-    return *failure;
+int ListEffects(const std::function<bool(int)>& visit) { return List(&Effects::effects, visit); }
+
+int ListPresets(const std::function<bool(int)>& visit) { return List(&Effects::presets, visit); }
+
+int GetRange(int effect, Range& range) {
+  const auto effects = Get<Effects>();
+  if (IndexOf(effect) >= effects->ranges.size() || !Contains(effects->effects, effect)) {
+    return Refuse(PLAYER_ERROR_INVALID_PARAMETER, "the effect isn't supported");
   }
-  if (player == nullptr) return Refuse(PLAYER_ERROR_INVALID_PARAMETER, "the player is null");
-  std::lock_guard lock(player->mutex);
-  player->Open(nullptr);
-  if (path == nullptr || *path == '\0') {
-    return Refuse(PLAYER_ERROR_INVALID_PARAMETER, "the path is empty");
-  }
-  player->Open(NextMedia());
-  return PLAYER_ERROR_NONE;
-} catch (const std::bad_alloc&) {
-  return Refuse(PLAYER_ERROR_OUT_OF_MEMORY, "no memory for the file");
+  const auto [min, max, initial] = effects->ranges[IndexOf(effect)];
+  range = {min, max, initial};
+  return kOk;
 }
 
-int player_close(player_h player) {
-  if (auto failure = Host::OnCall("player_close", "%s", "")) return *failure;
-  if (player == nullptr) return Refuse(PLAYER_ERROR_INVALID_PARAMETER, "the player is null");
-  std::lock_guard lock(player->mutex);
-  player->Open(nullptr);
-  return PLAYER_ERROR_NONE;
+int SetLevel(Player& player, int effect, int level) {
+  std::lock_guard lock(player.levelsMutex);
+  player.levels[IndexOf(effect)] = level;
+  return kOk;
 }
 
-int player_play(player_h player) {
-  if (auto failure = Host::OnCall("player_play", "%s", "")) return *failure;
-  return WithFile(player, [] { return PLAYER_ERROR_NONE; });
+int GetLevel(Player& player, int effect, int& level) {
+  const int initial = Get<Effects>()->ranges[IndexOf(effect)].initial;
+  std::lock_guard lock(player.levelsMutex);
+  level = player.levels[IndexOf(effect)].value_or(initial);
+  return kOk;
 }
 
-int player_pause(player_h player) {
-  if (auto failure = Host::OnCall("player_pause", "%s", "")) return *failure;
-  return WithFile(player, [] { return PLAYER_ERROR_NONE; });
+int SetPreset(Player&, int preset) {
+  if (Contains(Get<Effects>()->presets, preset)) return kOk;
+  return Refuse(PLAYER_ERROR_INVALID_PARAMETER, "the preset isn't supported");
 }
 
-int player_seek(player_h player, long position, bool exact) {
-  if (auto failure = Host::OnCall("player_seek", "%ld, %s", position, exact ? "true" : "false")) {
-    return *failure;
-  }
-  return WithFile(player, [=] { return player->Seek(position, exact); });
-}
-
-int player_get_position(player_h player, long* position) {
-  if (auto failure = Host::OnCall("player_get_position", "%s", "")) return *failure;
-  return WithFile(player, [=] { return *position = player->position, PLAYER_ERROR_NONE; });
-}
-
-int player_get_duration(player_h player, long* duration) {
-  if (auto failure = Host::OnCall("player_get_duration", "%s", "")) return *failure;
-  return WithFile(player, [=] { return *duration = player->media->duration, PLAYER_ERROR_NONE; });
-}
-
-int player_is_key_frame(player_h player, bool* key_frame) {
-  if (auto failure = Host::OnCall("player_is_key_frame", "%s", "")) return *failure;
-  return WithFile(player, [=] { return *key_frame = player->showsKeyFrame, PLAYER_ERROR_NONE; });
-}
-
-int player_capture_frame(player_h player, player_frame_cb callback, void* user_data) {
-  if (auto failure = Host::OnCall("player_capture_frame", "%s", "")) return *failure;
-  return WithFile(player, [=]() -> int {
-    if (!player->media->hasVideo) {
-      return Refuse(PLAYER_ERROR_INVALID_OPERATION, "the file has no video");
-    }
-    try {
-      const Picture picture(player->position, player->media->duration);
-      callback(picture.pixels.data(), Picture::kWidth, Picture::kHeight, Picture::kStride,
-               user_data);
-      return PLAYER_ERROR_NONE;
-    } catch (const std::bad_alloc&) {
-      return Refuse(PLAYER_ERROR_OUT_OF_MEMORY, "no memory for a frame");
-    }
-  });
-}
-
-int player_render_audio(player_h player, const char* path) {
-  if (auto failure = Host::OnCall("player_render_audio", "%s", path == nullptr ? "null" : path)) {
-    return *failure;
-  }
-  return WithFile(player, [] {
-    return Refuse(PLAYER_ERROR_INVALID_OPERATION, "a simulated player's sound can't be heard");
-  });
-}
-
-}  // extern "C"
+}  // namespace PlayerDevice
 
 namespace Simulated {
 
-void SetMedia(const Media& media) {
-  auto copy = std::make_shared<const Media>(media);
-  std::lock_guard lock(mediaMutex);
-  nextMedia = std::move(copy);
-}
+void SetMedia(const Media& media) { Set(media); }
+
+void SetEffects(const Effects& effects) { Set(effects); }
 
 void ResetPlayer() {
   SetMedia(Media());
-  ResetEffects();
+  SetEffects(Effects());
 }
 
 }  // namespace Simulated

@@ -22,7 +22,9 @@ void RecordCalls(bool on);
 /// "player_seek(4200, false)". Forgets them.
 std::vector<std::string> TakeCalls();
 
-/// Makes calls of a platform function fail: the function returns \p code and does nothing else.
+/// Makes calls of a platform function fail.
+/// \param function its name, with its class where it has one: "player_seek", "SystemInfo::GetValue"
+/// \param code what it returns, doing nothing else
 /// \param nth which call from now on, the next being 1; 0 for every call
 void FailCall(const char* function, int code, unsigned nth = 0);
 inline void FailCall(const char* function, result code, unsigned nth = 0) {

@@ -12,8 +12,4 @@ void WaitUntilDelivered();
 /// For a device: what `WaitUntilDelivered` calls first, to return when the callbacks have been called.
 void SetDeviceWait(void (*wait)());
 
-/// For a device that is about to fire an event, and only waits for what to say in it: keeps the
-/// dispatcher awake for a moment, so that delivery doesn't wait for it to wake up.
-void ExpectEvents();
-
 }  // namespace Host

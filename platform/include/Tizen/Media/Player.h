@@ -10,6 +10,9 @@ namespace Tizen::Media {
 class _PlayerImpl;
 
 /// A picture: rows from top to bottom without padding, three bytes (red, green, blue) a pixel.
+///
+/// It stands upright, and its pixels are square, whichever way the file stores it. A picture that
+/// is known to be damaged is never handed out; damage that the decoder conceals can't be known.
 struct VideoFrame {
   int width = 0;
   int height = 0;
@@ -45,13 +48,18 @@ class Player : public Tizen::Base::Object {
   /// Closes the file. \return `E_SUCCESS`, also when no file is open
   result Close();
 
-  /// Starts or resumes playing.
+  /// Starts or resumes playing; at the end of the file, from its start again.
   /// \return `E_SUCCESS`, `E_INVALID_STATE` when no file is open, `E_SYSTEM`
   result Play();
 
   /// Pauses at the current position.
   /// \return `E_SUCCESS`, `E_INVALID_STATE` when no file is open, `E_SYSTEM`
   result Pause();
+
+  /// Tells whether playing has come to the end of the file. The player then stands there: its
+  /// position is the end, `CaptureFrame` gives the last picture, and a seek leaves it paused.
+  /// \return false also when no file is open
+  bool IsAtEnd() const;
 
   /// \return the position in milliseconds, or -1: `E_INVALID_STATE` when no file is open, else
   /// `E_SYSTEM`
@@ -62,22 +70,30 @@ class Player : public Tizen::Base::Object {
   long GetDuration() const;
 
   /// Tells whether the last seek showed a key frame: a frame that is decoded without any other.
-  /// \return false also when there was no seek or no file is open
+  /// \return false also when there was no seek or no file is open, or when nobody can know
   bool IsKeyFrame() const;
+
+  /// Finds all key frames of the file, which is read whole for it: that takes as long as the file
+  /// needs. Closing the file meanwhile, on another thread, ends it.
+  /// \param positions receives where they are, ascending, in milliseconds; untouched on failure
+  /// \return `E_SUCCESS`; `E_INVALID_STATE` when no file is open; `E_INVALID_OPERATION` when the
+  /// file has no video; `E_OUT_OF_MEMORY`; `E_SYSTEM`
+  result GetKeyFrames(std::vector<long>& positions) const;
 
   /// Copies the frame at the current position.
   /// \param frame receives the picture; untouched on failure
   /// \return `E_SUCCESS`; `E_INVALID_STATE` when no file is open; `E_INVALID_OPERATION` when the
-  /// file has no video; `E_OUT_OF_MEMORY`; `E_SYSTEM`
+  /// file has no video; `E_OUT_OF_MEMORY`; `E_SYSTEM`, also when there is no frame, as before video
+  /// that starts late, or the frame is damaged
   result CaptureFrame(VideoFrame& frame) const;
 
-  /// Writes the sound of the open file, as it would be heard with the effects that are set, to a WAV
-  /// file of 16-bit stereo samples, faster than in real time. Position and playing go on as they were.
-  /// Unlike other operations it takes as long as the file needs.
+  /// Writes the sound of the open file, as it would be heard with the effects that are set, to a
+  /// WAV file of 16-bit stereo samples, faster than in real time. Position and playing go on as
+  /// they were. Unlike other operations it takes as long as the file needs.
   /// \param path the file to write; one that exists is replaced, and a failure leaves none
-  /// \return `E_SUCCESS`; `E_INVALID_ARG` for a null or empty path; `E_INVALID_STATE` when no file is
-  /// open; `E_INVALID_OPERATION` when the file has no sound, or the device renders none; `E_SYSTEM`
-  /// when the file can't be written or the media framework fails
+  /// \return `E_SUCCESS`; `E_INVALID_ARG` for a null or empty path; `E_INVALID_STATE` when no file
+  /// is open; `E_INVALID_OPERATION` when the file has no sound, or the device renders none;
+  /// `E_SYSTEM` when the file can't be written or the media framework fails
   result RenderAudio(const char* path) const;
 
  private:

@@ -24,12 +24,12 @@ class _PlayerImpl : public Tizen::Base::Object {
 
   /// Moves the player and returns when the new position is known.
   /// \param msTime the position to move to, in milliseconds, from 0 to the length
-  /// \param exact false: to a key frame near the position, at or before it where there is one;
-  /// true: to the position itself
+  /// \param exact false: to the last key frame at or before the position, or to the first one of
+  /// all; true: to the position itself
   /// \return `E_SUCCESS`; `E_INVALID_STATE` when no file is open; `E_INVALID_ARG` for a position
-  /// outside the file; `E_INVALID_OPERATION` when the file has no video; `E_SYSTEM` when the media
-  /// framework fails or doesn't answer in time. Failures are logged; success leaves the last
-  /// result alone.
+  /// outside the file; `E_INVALID_OPERATION` when the file has no video or can't be sought in;
+  /// `E_OUT_OF_MEMORY`; `E_SYSTEM` when there is no intact key frame, or the media framework fails
+  /// or doesn't answer in time. Failures are logged; success leaves the last result alone.
   result SeekTo(long msTime, bool exact);
 
   /// The native player; null before `Construct`.

@@ -9,33 +9,35 @@
 
 namespace Tizen::Base::Runtime {
 
-/// An event that tells its listeners later, on the process's one dispatcher thread, in the order of
+class _EventListeners;
+
+/// An event that tells its listeners later, on the process's one event thread, in the order of
 /// firing over all events.
 ///
 /// All operations but construction, `Initialize` and destruction may be called on any thread at any
 /// time, also from inside a listener's call. An exception that leaves a listener is logged and ends
-/// there. At process exit the dispatcher stops once the call that is running has returned, and
-/// frees what is still queued; events may live on.
+/// there. At process exit the thread stops once the call that is running has returned, and
+/// frees what is still queued; events may live on. A forked child has no such thread: there
+/// everything but destruction fails with `E_SYSTEM`.
 class _Event : public Tizen::Base::Object {
  public:
   _Event();
 
-  /// Drops and frees what is still queued, and waits for a listener's call that is running and for
-  /// the arguments that were delivered to be freed. From inside a listener's call it doesn't wait: of
-  /// this very event the other listeners then hear nothing more, and what was delivered is freed
-  /// later.
+  /// Drops and frees what is still queued, and waits for a listener's call that is running and its
+  /// argument to be freed. From inside a listener's call it doesn't wait: the other listeners then
+  /// hear nothing more, and the argument is freed after the call.
   ~_Event() override;
 
   /// Makes the event ready; until then every other operation fails with `E_INVALID_STATE`. The type
   /// that the object has now is the one whose `FireToListener` is called.
   /// \return `E_SUCCESS`; `E_INVALID_OPERATION` when it is ready already; `E_OUT_OF_MEMORY`;
-  /// `E_SYSTEM` when the dispatcher can't be started
+  /// `E_SYSTEM` when the event thread can't be started
   result Initialize();
 
   /// Adds a listener, which hears what is fired from now on, not what is queued already, and must
   /// live until it is removed.
   /// \param listener the listener, which isn't owned
-  /// \param once true: it hears one event only and is removed before that call
+  /// \param once false; listeners that hear one event only are `E_UNSUPPORTED_OPERATION`
   /// \return `E_SUCCESS`; `E_INVALID_OPERATION` when it is added already; `E_OUT_OF_MEMORY`
   result AddListener(const IEventListener& listener, bool once);
 
@@ -45,9 +47,9 @@ class _Event : public Tizen::Base::Object {
   result RemoveListener(const IEventListener& listener);
 
   /// Queues \p arg, which was made with `new` and belongs to the platform from now on: it is freed
-  /// after the last delivery, on any thread, or at once when this fails. Allocates nothing.
-  /// \return `E_SUCCESS`, or another code when nothing was queued; `E_SYSTEM` when the process is
-  /// ending
+  /// after the last delivery, or at once when this fails.
+  /// \return `E_SUCCESS`, or another code when nothing was queued: `E_OUT_OF_MEMORY`; `E_SYSTEM` when
+  /// the process is ending
   result FireAsync(IEventArg& arg);
 
  protected:
@@ -55,10 +57,9 @@ class _Event : public Tizen::Base::Object {
   virtual void FireToListener(IEventListener& listener, const IEventArg& arg) = 0;
 
  private:
-  friend class _Dispatcher;
-  class _Listeners;
+  friend class _EventListeners;
 
-  std::unique_ptr<_Listeners> __pListeners;  // null until the event is ready
+  std::unique_ptr<_EventListeners> __pListeners;  // null until the event is ready
 };
 
 }  // namespace Tizen::Base::Runtime

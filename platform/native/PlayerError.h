@@ -22,6 +22,20 @@ inline result ConvertPlayerErrorToResult(int error) {
   }
 }
 
+/// While it lives, what fails on this thread is logged as a reason only, because whoever called logs
+/// the failure.
+class ReasonsOnly {
+ public:
+  ReasonsOnly();
+  ~ReasonsOnly();
+
+  ReasonsOnly(const ReasonsOnly&) = delete;
+  ReasonsOnly& operator=(const ReasonsOnly&) = delete;
+
+ private:
+  const bool before_;
+};
+
 /// Logs why a player's function fails and gives back \p error, so that a failure is one statement. The
 /// last result belongs to those that call the native functions; it isn't touched.
 /// The message is put behind the code's name: "[E_INVALID_STATE] no file is open".

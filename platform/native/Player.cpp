@@ -88,6 +88,33 @@ bool Player::IsKeyFrame() const {
   return Call(__pPlayerImpl, player_is_key_frame, &keyFrame) == E_SUCCESS && keyFrame;
 }
 
+bool Player::IsAtEnd() const {
+  bool atEnd = false;
+  return Call(__pPlayerImpl, player_is_at_end, &atEnd) == E_SUCCESS && atEnd;
+}
+
+result Player::GetKeyFrames(std::vector<long>& positions) const {
+  struct List {
+    std::vector<long> positions;
+    bool isComplete = true;
+  } list;
+  const auto add = [](long position, void* userData) {
+    auto& target = *static_cast<List*>(userData);
+    try {
+      target.positions.push_back(position);
+    } catch (const std::bad_alloc&) {
+      target.isComplete = false;
+    }
+    return target.isComplete;
+  };
+  const result r = Call(__pPlayerImpl, player_foreach_key_frame, player_key_frame_cb(add),
+                        static_cast<void*>(&list));
+  if (r != E_SUCCESS) return r;
+  if (!list.isComplete) return Fail(E_OUT_OF_MEMORY, "no memory for the key frames");
+  positions = std::move(list.positions);
+  return E_SUCCESS;
+}
+
 result Player::CaptureFrame(VideoFrame& frame) const {
   VideoFrame captured;
   const auto copy = [](const unsigned char* pixels, int width, int height, int stride,

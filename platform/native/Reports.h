@@ -1,0 +1,30 @@
+/// \file
+/// What native/ gives a device's sound manager: reports to the program, and the program's session.
+#pragma once
+
+namespace Native {
+
+enum class Kind { kVolume, kMuteAll, kInterruption };
+
+/// \return whether the program has set a callback for reports of a kind.
+bool IsListening(Kind kind);
+
+/// \name Reports
+/// Queued for the program's callback, if there is one, which is called on another thread: a device may
+/// report with its own lock held. Throw `std::bad_alloc`, with nothing done.
+/// @{
+void ReportLevel(int type, int level);
+void ReportMuteAll(bool isMuted);
+void ReportInterruption(int code);
+/// @}
+
+/// The session's settings, which native/ keeps.
+struct Session {
+  int type = 0;
+  int options[2] = {0, 0};
+};
+
+Session GetSession();
+void SetSession(const Session& session);
+
+}  // namespace Native

@@ -10,6 +10,11 @@ Batch::~Batch() {
   }
 }
 
+int Batch::Await(Connection::Lock& lock, Connection::Time limit) {
+  const int error = connection_.Await(lock, limit, [this] { return outstanding_ == 0; });
+  return error != SOUND_MANAGER_ERROR_NONE ? error : ToErrorCode(error_);
+}
+
 void Batch::Keep(pa_operation* operation) {
   if (operation == nullptr) {
     error_ = PA_ERR_BADSTATE;
@@ -35,8 +40,8 @@ void Batch::OnOptionalAnswer(pa_context*, int, void* self) {
 void Batch::Finish(int error) {
   if (error_ == PA_OK) error_ = error;
   if (--outstanding_ > 0) return;
-  if (error_ == PA_OK) onSuccess_();
-  loop_.NotifyProgress();
+  if (error_ == PA_OK && onSuccess_ != nullptr) onSuccess_();
+  connection_.NotifyProgress();
 }
 
 }  // namespace Desktop

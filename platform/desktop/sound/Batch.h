@@ -1,8 +1,8 @@
 /// \file
 #pragma once
 
+#include "Connection.h"
 #include "Pulse.h"
-#include "PulseLoop.h"
 
 #include <functional>
 #include <vector>
@@ -10,20 +10,16 @@
 namespace Desktop {
 
 /// Requests that a caller sends in one go, and the server's answers to them. Lives and dies under the
-/// loop's lock; requests that aren't answered by then are forgotten.
+/// connection's lock; requests that aren't answered by then are forgotten.
 class Batch {
  public:
-  /// \param onSuccess called on the loop's thread with the last answer, if no request was refused,
-  /// and so in the order of all other answers
-  Batch(PulseLoop& loop, std::function<void()> onSuccess)
-      : loop_(loop), onSuccess_(std::move(onSuccess)) {}
+  explicit Batch(Connection& connection) : connection_(connection) {}
   ~Batch();
 
   Batch(const Batch&) = delete;
   Batch& operator=(const Batch&) = delete;
 
-  /// Adds the request that \p send makes: of the context, with the callback and user data it is
-  /// given.
+  /// Adds the request that \p send makes with the callback and user data it is given.
   template <typename Send>
   void Add(Send send) {
     Keep(send(OnAnswer, this));
@@ -41,12 +37,12 @@ class Batch {
     Keep(send(OnOptionalAnswer, this));
   }
 
-  /// The loop tells of progress when it changes. Requests that couldn't be made have failed by the
-  /// time this is asked.
-  bool IsDone() const { return outstanding_ == 0; }
+  /// Has \p onSuccess called on the connection's thread with the last answer, if no request was
+  /// refused, and so in the order of all other answers.
+  void WhenDone(std::function<void()> onSuccess) { onSuccess_ = std::move(onSuccess); }
 
-  /// \return the native code of the first refusal, or 0
-  int GetErrorCode() const { return ToErrorCode(error_); }
+  /// Waits until all requests are answered. \return a native code, of the first refusal if any
+  int Await(Connection::Lock& lock, Connection::Time limit);
 
  private:
   static void OnAnswer(pa_context* context, int success, void* self);
@@ -56,7 +52,7 @@ class Batch {
   void Keep(pa_operation* operation);
   void Finish(int error);
 
-  PulseLoop& loop_;
+  Connection& connection_;
   std::function<void()> onSuccess_;
   std::vector<OperationPtr> operations_;
   std::size_t outstanding_ = 0;

@@ -1,5 +1,5 @@
 /// \file
-/// Sound categories, their media roles on the server, and their levels.
+/// Sound categories, their media roles on the server, their levels and volumes.
 #pragma once
 
 #include <pulse/volume.h>
@@ -40,8 +40,6 @@ inline constexpr std::array<RoleRow, 8> kRoles = {{{"event", kSystem},
                                                    {"game", kMedia},
                                                    {"phone", kCall}}};
 
-constexpr bool IsCategory(int type) { return type >= 0 && type < static_cast<int>(kCategories); }
-
 inline constexpr std::size_t kNoRole = kRoles.size();
 
 /// \return the role's place in the table, or `kNoRole`
@@ -51,10 +49,15 @@ inline std::size_t FindRole(const char* role) {
   return i;
 }
 
+/// \param role null for a stream without one
+inline Category FindCategory(const char* role) {
+  if (role == nullptr) return kMedia;
+  const std::size_t row = FindRole(role);
+  return row == kNoRole ? kNoCategory : kRoles[row].category;
+}
+
 /// Every category's highest level; it stands for a volume of 100 %.
 inline constexpr int kMaxLevel = 15;
-
-constexpr bool IsLevel(int level) { return level >= 0 && level <= kMaxLevel; }
 
 constexpr pa_volume_t ToVolume(int level) {
   return (static_cast<pa_volume_t>(level) * PA_VOLUME_NORM + kMaxLevel / 2) / kMaxLevel;
@@ -73,5 +76,31 @@ constexpr bool DoLevelsComeBack() {
   return true;
 }
 static_assert(DoLevelsComeBack(), "a level that is set must be read as the same");
+
+/// A volume as it was told last, and its balance, which level 0 would lose.
+class Volume {
+ public:
+  void Put(const pa_cvolume& volume) {
+    volume_ = volume;
+    const bool hasBalance = pa_cvolume_max(&volume) > PA_VOLUME_MUTED;
+    if (hasBalance || balance_.channels != volume.channels) balance_ = volume;
+  }
+
+  /// \return whether there is one; the server may keep none
+  bool Exists() const { return volume_.channels > 0; }
+
+  /// \return the level of the loudest channel
+  int GetLevel() const { return ToLevel(pa_cvolume_max(&volume_)); }
+
+  /// \return the volume with another level, in the same balance
+  pa_cvolume At(int level) const {
+    pa_cvolume scaled = balance_;
+    return *pa_cvolume_scale(&scaled, ToVolume(level));
+  }
+
+ private:
+  pa_cvolume volume_ = {};
+  pa_cvolume balance_ = {};
+};
 
 }  // namespace Desktop

@@ -3,21 +3,82 @@
 #include <utility>
 
 namespace Desktop {
+namespace {
 
-void Interruptions::Update() {
+/// \return false only for a port that is known to have nothing plugged in
+bool IsPlugged(const pa_sink_info& info, const std::string& port) {
+  for (std::uint32_t i = 0; i < info.n_ports; ++i) {
+    if (info.ports[i]->name == port) return info.ports[i]->available != PA_PORT_AVAILABLE_NO;
+  }
+  return true;
+}
+
+}  // namespace
+
+void Output::Put(const pa_sink_info& info) {
+  const bool isSuspended = info.state == PA_SINK_SUSPENDED;
+  if (Is(info.index)) {
+    if (WasUnplugged(info)) reports_.ReportInterruption(kOutputGone);
+    // A sink that is idle may be suspended by the server itself; one that plays only by a program.
+    if (isSuspended && !sink_->isSuspended && streams_.IsPlayerHeardOn(info.index)) {
+      reports_.ReportInterruption(kTakenOver);
+    }
+  }
+  const std::string port = info.active_port != nullptr ? info.active_port->name : "";
+  sink_ = Sink{info.index, port, IsPlugged(info, port), isSuspended};
+  OnMuted(info.mute != 0);
+}
+
+/// \return whether what was heard until now has just been unplugged; the server goes on to another
+/// port by itself, before or after it tells
+bool Output::WasUnplugged(const pa_sink_info& info) const {
+  return sink_->isPlugged && !IsPlugged(info, sink_->port);
+}
+
+void Output::OnRemoved() {
+  removed_ = sink_->index;
+  sink_.reset();
+  reports_.ReportInterruption(kOutputGone);
+}
+
+void Output::OnServerLost() {
+  sink_.reset();
+  removed_.reset();
+}
+
+void Output::OnMuted(bool isMuted) {
+  const bool changed = isMuted_ && *isMuted_ != isMuted;
+  isMuted_ = isMuted;
+  if (changed) reports_.ReportMuteAll(isMuted);
+}
+
+bool Interruptions::Update() {
   const bool isCall = streams_.IsHeardFromOthers(kCall);
   const bool isInterrupted = isCall || streams_.IsHeardFromOthers(kAlarm);
-  if (isInterrupted == (started_ != kFinished)) return;
-  started_ = !isInterrupted ? kFinished : isCall ? kCallStarted : kAlarmStarted;
-  reports_.ReportInterruption(started_);
+  if (isInterrupted && started_ == kFinished) {
+    started_ = isCall ? kCallStarted : kAlarmStarted;
+    reports_.ReportInterruption(started_);
+  }
+  return (!isInterrupted && started_ != kFinished) || !killed_.empty();
+}
+
+void Interruptions::Settle() {
+  for (const auto& [stream, sink] : std::exchange(killed_, {})) {
+    if (streams_.Has(stream) || output_.WasRemoved(sink)) continue;
+    reports_.ReportInterruption(kTakenOver);
+  }
+  if (!Update()) return;
+  started_ = kFinished;
+  reports_.ReportInterruption(kFinished);
 }
 
 void Interruptions::OnServerLost() {
   started_ = kFinished;
+  killed_.clear();
   reports_.ReportInterruption(kServerLost);
 }
 
-void Interruptions::Repeat() {
+void Interruptions::Repeat() const {
   if (started_ != kFinished) reports_.ReportInterruption(started_);
 }
 

@@ -2,7 +2,7 @@
 /// Owners for what libpulse hands out, and its error codes in the native interface's terms.
 #pragma once
 
-#include "../FreeWith.h"
+#include "desktop/FreeWith.h"
 
 #include <pulse/ext-stream-restore.h>
 #include <pulse/pulseaudio.h>

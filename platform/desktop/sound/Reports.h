@@ -1,41 +1,46 @@
 /// \file
 #pragma once
 
-#include "Categories.h"
-#include "sound/CallbackThread.h"
+#include "Log.h"
+#include "native/Reports.h"
+
+#include <array>
+#include <cstddef>
+#include <new>
 
 namespace Desktop {
 
-/// What the program hears from the device: callbacks on a thread of their own, so that they may use
-/// the sound manager. Reports are made one at a time, under the loop's lock.
+/// What the program hears; nothing of it throws. A kind that is silent isn't heard, while its new
+/// callback learns how things are: what had changed before it was set is no change to it. Under the
+/// connection's lock.
 class Reports {
  public:
-  using Callback = Host::CallbackThread::Callback;
+  using Kind = Native::Kind;
 
-  /// \name Reports, none of which throws
-  /// @{
-  void ReportLevel(Category category, int level) noexcept;
-  void ReportMuteAll(bool isMuted) noexcept;
-  void ReportInterruption(int code) noexcept;
-  /// @}
+  void ReportLevel(int category, int level) const {
+    Report(Kind::kVolume, [=] { Native::ReportLevel(category, level); });
+  }
+  void ReportMuteAll(bool isMuted) const {
+    Report(Kind::kMuteAll, [=] { Native::ReportMuteAll(isMuted); });
+  }
+  void ReportInterruption(int code) const {
+    Report(Kind::kInterruption, [=] { Native::ReportInterruption(code); });
+  }
 
-  /// A level is likely to be reported at once.
-  void ExpectLevel() noexcept;
-
-  /// Throws when memory or threads are short.
-  void Set(Host::Kind kind, Callback callback) { thread_.Set(kind, std::move(callback)); }
-
-  /// Waits for a callback that runs, which may need the loop's lock: it must not be held.
-  void Unset(Host::Kind kind) { thread_.Unset(kind); }
-
-  /// Waits until the callbacks for what was reported have returned. The loop's lock must not be held.
-  void AwaitCallbacks() { thread_.WaitUntilReported(); }
+  void Silence(Kind kind) { ++silences_[ToIndex(kind)]; }
+  void EndSilence(Kind kind) { --silences_[ToIndex(kind)]; }
 
  private:
-  void Post(Host::Kind kind, int first, int second) noexcept;
+  static std::size_t ToIndex(Kind kind) { return static_cast<std::size_t>(kind); }
 
-  std::mutex mutex_;
-  Host::CallbackThread thread_{mutex_};
+  template <typename Function>
+  void Report(Kind kind, Function report) const noexcept try {
+    if (silences_[ToIndex(kind)] == 0) report();
+  } catch (const std::bad_alloc&) {
+    LogFailure("A report to the program is lost", "out of memory");
+  }
+
+  std::array<int, 3> silences_ = {};
 };
 
 }  // namespace Desktop

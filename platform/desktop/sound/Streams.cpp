@@ -16,6 +16,11 @@ bool HasStream(const Streams::Map& streams, Condition condition) {
                      [&](const auto& entry) { return condition(entry.second); });
 }
 
+bool HasProperty(const pa_sink_input_info& info, const char* key, const std::string& expected) {
+  const char* value = pa_proplist_gets(info.proplist, key);
+  return value != nullptr && value == expected;
+}
+
 }  // namespace
 
 Streams::Streams() : process_(std::to_string(getpid())) {
@@ -23,42 +28,26 @@ Streams::Streams() : process_(std::to_string(getpid())) {
   if (pa_get_host_name(name.data(), name.size()) != nullptr) host_ = name.data();
 }
 
-Stream Streams::Describe(const pa_sink_input_info& info) const {
-  const auto property = [&](const char* key) { return pa_proplist_gets(info.proplist, key); };
-  const auto is = [&](const char* key, const std::string& expected) {
-    const char* value = property(key);
-    return value != nullptr && value == expected;
-  };
-  Stream stream;
-  const char* role = property(PA_PROP_MEDIA_ROLE);
-  if (role == nullptr) {
-    stream.category = kMedia;
-  } else {
-    stream.role = FindRole(role);
-    if (stream.HasRole()) stream.category = kRoles[stream.role].category;
-  }
-  stream.hasStoredVolume =
-      stream.HasRole() && is("module-stream-restore.id", std::string(kEntryPrefix) + role);
+const Stream& Streams::Put(const pa_sink_input_info& info, bool isToldInParts) {
+  Stream& stream = streams_[info.index];
+  stream.category = FindCategory(pa_proplist_gets(info.proplist, PA_PROP_MEDIA_ROLE));
   stream.sink = info.sink;
-  stream.volume = info.volume;
+  stream.volume.Put(info.volume);
   stream.canChangeVolume = info.has_volume && info.volume_writable;
   stream.isMuted = info.mute;
   stream.isCorked = info.corked;
-  stream.isOwn =
-      is(PA_PROP_APPLICATION_PROCESS_ID, process_) && is(PA_PROP_APPLICATION_PROCESS_HOST, host_);
-  stream.isPlayer = stream.isOwn && property(kPlayerProperty) != nullptr;
+  stream.isVolumeKnown = stream.isVolumeKnown || !isToldInParts || !stream.isCorked ||
+                         !pa_cvolume_is_muted(&info.volume);
+  stream.isOwn = HasProperty(info, PA_PROP_APPLICATION_PROCESS_ID, process_) &&
+                 HasProperty(info, PA_PROP_APPLICATION_PROCESS_HOST, host_);
+  stream.isPlayer = stream.isOwn && pa_proplist_contains(info.proplist, kPlayerProperty) != 0;
+  stream.isBeingRead = false;
   return stream;
 }
 
 Stream* Streams::Find(std::uint32_t index) {
   const auto found = streams_.find(index);
   return found == streams_.end() ? nullptr : &found->second;
-}
-
-bool Streams::IsAnyMuted(Category category) const {
-  return HasStream(streams_, [=](const Stream& stream) {
-    return stream.category == category && stream.isMuted;
-  });
 }
 
 bool Streams::IsHeardFromOthers(Category category) const {

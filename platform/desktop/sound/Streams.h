@@ -13,44 +13,41 @@ namespace Desktop {
 /// A playback stream on the server, of any program.
 struct Stream {
   Category category = kNoCategory;
-  std::size_t role = kNoRole;
   std::uint32_t sink = PA_INVALID_INDEX;
-  pa_cvolume volume = {};
+  Volume volume;
+  bool isVolumeKnown = false;
   bool canChangeVolume = false;
-  bool hasStoredVolume = false;  ///< the server keeps its volume under its role
   bool isMuted = false;
   bool isCorked = false;
-  bool isOwn = false;     ///< of this process
-  bool isPlayer = false;  ///< of one of this process's players
-  bool isBeingRead = false;
-  bool isToBeRead = false;  ///< though hardly anything new is known of it
-  bool isEchoDue = false;   ///< this process has moved it, of which the server will tell
+  bool isOwn = false;        ///< of this process
+  bool isPlayer = false;     ///< of one of this process's players
+  bool isBeingRead = false;  ///< an answer about it is on its way
 
   bool IsHeard() const { return !isCorked && !isMuted; }
-  bool HasRole() const { return role != kNoRole; }
-  int GetLevel() const { return ToLevel(pa_cvolume_max(&volume)); }
 };
 
-/// The playback streams that are on the server, as last told. Under the loop's lock.
+/// The playback streams that are on the server, as last told. Under the connection's lock.
 class Streams {
  public:
   using Map = std::unordered_map<std::uint32_t, Stream>;
 
   Streams();
 
-  /// \return the stream as it is told now
-  Stream Describe(const pa_sink_input_info& info) const;
+  /// Puts in what is told of a stream.
+  /// \param isToldInParts whether a new stream is first told corked and with volume 0, whatever its
+  /// volume is
+  /// \return the stream as it is now
+  const Stream& Put(const pa_sink_input_info& info, bool isToldInParts);
+
+  bool Has(std::uint32_t index) const { return streams_.count(index) > 0; }
 
   /// \return the stream with this number, or null
   Stream* Find(std::uint32_t index);
 
-  void Put(std::uint32_t index, const Stream& stream) { streams_[index] = stream; }
   void Remove(std::uint32_t index) { streams_.erase(index); }
   void Clear() { streams_.clear(); }
 
   Map& All() { return streams_; }
-
-  bool IsAnyMuted(Category category) const;
 
   /// \return whether another program's stream of the category is heard
   bool IsHeardFromOthers(Category category) const;

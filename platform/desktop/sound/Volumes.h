@@ -7,74 +7,79 @@
 #include "Streams.h"
 
 #include <array>
+#include <optional>
 #include <string>
+#include <vector>
 
 namespace Desktop {
 
-/// The volume that the server keeps for a role.
-struct StoredVolume {
-  bool exists = false;
-  pa_channel_map map = {};
-  pa_cvolume volume = {};  ///< no channels: none is kept
-  bool isMuted = false;
-  std::string device;
-  bool isToldByStream = false;  ///< concluded from a stream's volume, before it was read
-
-  /// \return the level of the role's streams; they start at 100 % when nothing is kept
-  int GetLevel() const;
-
-  /// \return whether the volume is the same one for a stream that has it, whatever its channels
-  bool IsSameForAll() const;
-
-  /// \return the same with another level, keeping the balance
-  StoredVolume WithLevel(int level) const;
-};
-
-/// The categories' levels, as last told by the server. A category's level is the one that was last
-/// given to one of its roles or streams, by anybody. Under the loop's lock.
+/// The categories' levels. A category's level is that of its stored volume or live stream that changed
+/// last, by anybody. Under the connection's lock.
+///
+/// The server answers a connection in order. So a value that differs from the one known is a change,
+/// and what this process itself sets is known from its answer on: no change is told twice.
 class Volumes {
  public:
-  Volumes(Reports& reports, Streams& streams) : reports_(reports), streams_(streams) {}
+  Volumes(const Reports& reports, Streams& streams) : reports_(reports), streams_(streams) {}
+
+  /// There is a new connection: what it tells first isn't a change of anything.
+  void Begin();
 
   /// \return whether the server keeps volumes for roles at all
   bool AreStored() const { return areStored_; }
 
-  int GetLevel(Category category) const { return levels_[ToIndex(category)]; }
+  int GetLevel(Category category) const { return levels_[ToIndex(category)].value_or(kMaxLevel); }
 
   /// \name An answer to `pa_ext_stream_restore_read`
   /// @{
-  void OnEntry(const pa_ext_stream_restore_info& entry);
-  /// \return false when the answer may be older than what a stream told, so that it must be asked for
-  /// once more
-  bool OnEndOfEntries(bool succeeded);
+  void OnEntry(const pa_ext_stream_restore_info& info);
+  void OnEndOfEntries(bool succeeded);
   /// @}
 
-  /// A stream of a category was moved.
-  /// \param isStored whether the server stores the volume for the stream's role as well, and tells so
-  void OnStreamMoved(const Stream& stream, bool isStored);
+  /// What a stream's level changed to.
+  void OnStreamMoved(const Stream& stream);
 
-  /// Asks the server to store a level for a category's roles and to give it to its streams.
-  /// \param movesStreams whether the server itself moves the streams with the stored volume
-  void Send(pa_context* context, Category category, int level, bool movesStreams, Batch& batch);
+  /// Asks the server to store a level for a category's roles and to give it to its streams: their
+  /// volumes alone, because the server can also give them the stored sink, mute and balance.
+  /// \return the streams
+  std::vector<std::uint32_t> Send(pa_context* context, Category category, int level, Batch& batch);
 
-  /// The server has done what `Send` asked for.
-  void OnDone(Category category, int level);
+  /// The server has done what `Send` asked for, with these \p streams.
+  void OnDone(Category category, int level, const std::vector<std::uint32_t>& streams);
+
+  /// \return whether all that was told last of a category has this level
+  bool IsToldAs(Category category, int level) const;
 
  private:
-  using Stored = std::array<StoredVolume, kRoles.size()>;
+  /// What the server keeps for a role.
+  struct Entry {
+    bool exists = false;
+    pa_channel_map map = {};
+    Volume volume;
+    bool isMuted = false;
+    std::string device;
+
+    /// \return the level of the role's streams; they start at 100 % when nothing is kept
+    int GetLevel() const { return exists && volume.Exists() ? volume.GetLevel() : kMaxLevel; }
+
+    /// \return the volume with another level; balanced where nothing is kept
+    pa_cvolume At(int level) const;
+  };
+  using Entries = std::array<Entry, kRoles.size()>;
 
   static std::size_t ToIndex(Category category) { return static_cast<std::size_t>(category); }
 
-  void Begin();
+  void SendEntries(pa_context* context, Category category, int level, Batch& batch);
+  void PutLevelsAtStart();
   void Change(Category category, int level);
 
-  Reports& reports_;
+  const Reports& reports_;
   Streams& streams_;
+  bool isBeginning_ = true;
   bool areStored_ = false;
-  bool areKnown_ = false;
-  std::array<int, kCategories> levels_ = {};
-  Stored stored_;
-  Stored answer_;  // what has come of it
+  std::array<std::optional<int>, kCategories> levels_;  // last reported, or known without a change
+  Entries entries_;
+  Entries answer_;  // what has come of it
 };
 
 }  // namespace Desktop

@@ -1,0 +1,198 @@
+// What callers ask of the desktop's sound manager.
+
+#include "native/SoundDevice.h"
+
+#include "Picture.h"
+
+#include <unistd.h>
+
+#include <atomic>
+
+namespace Desktop {
+namespace {
+
+using Lock = Connection::Lock;
+using Time = Connection::Time;
+
+/// A local server answers within milliseconds; one that doesn't is stopped or stuck.
+constexpr std::chrono::seconds kAnswerLimit{1};
+
+/// How long to wait before PipeWire is asked again whether a change can be read.
+constexpr std::chrono::milliseconds kReadBackPause{1};
+
+/// The process that uses the device; a forked child has neither its thread nor its locks.
+std::atomic<pid_t> user{0};
+
+/// To be asked before any lock is taken: in a forked child its holder may be missing.
+bool IsInForkedChild() {
+  pid_t first = 0;
+  const pid_t self = getpid();
+  return !user.compare_exchange_strong(first, self) && first != self;
+}
+
+/// The picture of the server and the connection to it, made at the first use; never destroyed.
+struct Device {
+  Picture picture{connection};
+  Connection connection{picture};
+
+  /// Throws when memory or threads are short.
+  static Device& Get();
+};
+
+Device* theDevice = nullptr;  // once it is made
+
+/// Made when this library is loaded, and so destroyed after all that the program does at its exit.
+struct AtExit {
+  ~AtExit() {
+    if (theDevice != nullptr && !IsInForkedChild()) theDevice->connection.Stop();
+  }
+} const atExit;
+
+Device& Device::Get() {
+  static Device& made = *(theDevice = new Device);
+  return made;
+}
+
+/// Runs \p operation on the device under its lock. \return a native code
+template <typename Operation>
+int OnDevice(Operation operation) {
+  if (IsInForkedChild()) return SOUND_MANAGER_ERROR_NO_CONNECTION;
+  Device& made = Device::Get();
+  Lock lock = made.connection.Acquire();
+  return operation(made, lock, Connection::Clock::now() + kAnswerLimit);
+}
+
+/// PipeWire acknowledges a change before it can be read: waits until \p isTold after \p refresh.
+template <typename Refresh, typename Condition>
+int AwaitReadBack(Device& device, Lock& lock, Time limit, Refresh refresh, Condition isTold) {
+  while (device.picture.IsOfPipeWire()) {
+    if (const int error = refresh()) return error;
+    if (isTold()) break;
+    if (Connection::Clock::now() > limit) return kTimedOut;
+    device.connection.Rest(lock, kReadBackPause);
+  }
+  return SOUND_MANAGER_ERROR_NONE;
+}
+
+}  // namespace
+}  // namespace Desktop
+
+using Desktop::Batch;
+using Desktop::Device;
+using Desktop::Lock;
+using Desktop::OnDevice;
+using Desktop::Picture;
+using Desktop::Time;
+
+int SoundDevice::GetMaxLevel(int, int& max) {
+  max = Desktop::kMaxLevel;
+  return SOUND_MANAGER_ERROR_NONE;
+}
+
+int SoundDevice::GetLevel(int type, int& level) {
+  return OnDevice([&](Device& device, Lock& lock, Time limit) -> int {
+    if (const int error = device.picture.Refresh(lock, limit)) return error;
+    const Desktop::Volumes& volumes = device.picture.GetVolumes();
+    if (!volumes.AreStored()) return SOUND_MANAGER_ERROR_INVALID_OPERATION;
+    level = volumes.GetLevel(type);
+    return SOUND_MANAGER_ERROR_NONE;
+  });
+}
+
+int SoundDevice::SetLevel(int type, int level) {
+  return OnDevice([=](Device& device, Lock& lock, Time limit) -> int {
+    Picture& picture = device.picture;
+    Desktop::Volumes& volumes = picture.GetVolumes();
+    const auto refresh = [&] { return picture.Refresh(lock, limit); };
+    // What another program changed before is reported before, and what is stored is written as a
+    // whole.
+    if (const int error = refresh()) return error;
+    if (!volumes.AreStored()) return SOUND_MANAGER_ERROR_INVALID_OPERATION;
+    Batch batch(device.connection);
+    const auto streams = volumes.Send(device.connection.GetContext(), type, level, batch);
+    if (!picture.IsOfPipeWire()) batch.WhenDone([&] { volumes.OnDone(type, level, streams); });
+    if (const int error = batch.Await(lock, limit)) return error;
+    return AwaitReadBack(device, lock, limit, refresh,
+                         [&] { return volumes.IsToldAs(type, level); });
+  });
+}
+
+int SoundDevice::GetMuteAll(bool& muted) {
+  return OnDevice([&](Device& device, Lock& lock, Time limit) -> int {
+    if (const int error = device.picture.Refresh(lock, limit)) return error;
+    const Desktop::Output& output = device.picture.GetOutput();
+    if (!output.Exists()) return SOUND_MANAGER_ERROR_INVALID_OPERATION;
+    muted = output.IsMuted();
+    return SOUND_MANAGER_ERROR_NONE;
+  });
+}
+
+int SoundDevice::SetMuteAll(bool muted) {
+  return OnDevice([=](Device& device, Lock& lock, Time limit) -> int {
+    Picture& picture = device.picture;
+    Desktop::Output& output = picture.GetOutput();
+    const auto refresh = [&] { return picture.Refresh(lock, limit); };
+    // What another program changed before is reported before.
+    if (const int error = refresh()) return error;
+    Batch batch(device.connection);
+    batch.Add([&](pa_context_success_cb_t onAnswer, void* data) {
+      return pa_context_set_sink_mute_by_name(device.connection.GetContext(),
+                                              Desktop::Output::kName, muted, onAnswer, data);
+    });
+    if (!picture.IsOfPipeWire()) batch.WhenDone([&] { output.OnMuted(muted); });
+    if (const int error = batch.Await(lock, limit)) return error;
+    return AwaitReadBack(device, lock, limit, refresh, [&] { return output.IsMuted() == muted; });
+  });
+}
+
+void SoundDevice::OnSessionChanged() {}  // a player looks at the session with each buffer of sound
+
+/// What the callback is told are changes of what is so now, if there is a server.
+void SoundDevice::OnListening(Native::Kind kind, bool listening) {
+  if (!listening) return;
+  OnDevice([=](Device& device, Lock& lock, Time limit) -> int {
+    Desktop::Reports& reports = device.picture.GetReports();
+    reports.Silence(kind);
+    const int error = device.picture.Refresh(lock, limit);
+    reports.EndSilence(kind);
+    if (kind == Native::Kind::kInterruption) device.picture.GetInterruptions().Repeat();
+    return error;
+  });
+}
+
+void SoundDevice::AwaitReports() {
+  OnDevice([](Device& device, Lock& lock, Time limit) -> int {
+    return device.picture.Settle(lock, limit);  // without a server there is nothing to tell
+  });
+}
+
+int SoundDevice::OpenCall(int& number) {
+  return OnDevice([&](Device& device, Lock& lock, Time limit) -> int {
+    if (const int error = device.picture.Await(lock, limit)) return error;
+    return device.picture.GetCalls().Open(lock, limit, number);
+  });
+}
+
+/// In a forked child there is nothing to end: the session is the parent's.
+int SoundDevice::CloseCall(int number) {
+  if (Desktop::IsInForkedChild()) return SOUND_MANAGER_ERROR_NONE;
+  return OnDevice([=](Device& device, Lock& lock, Time limit) -> int {
+    return device.picture.GetCalls().Close(lock, limit, number);
+  });
+}
+
+int SoundDevice::SetCallMode(int number, int mode) {
+  return OnDevice([=](Device& device, Lock& lock, Time limit) -> int {
+    Desktop::Calls& calls = device.picture.GetCalls();
+    int before = 0;
+    if (const int error = calls.GetMode(number, before)) return error;
+    if (const int error = device.picture.Await(lock, limit)) return error;
+    return calls.SetMode(lock, limit, number, mode);
+  });
+}
+
+int SoundDevice::GetCallMode(int number, int& mode) {
+  return OnDevice([&](Device& device, Lock&, Time) -> int {
+    return device.picture.GetCalls().GetMode(number, mode);
+  });
+}

@@ -5,9 +5,9 @@
 
 namespace Desktop {
 
-/// The last stage of the effects: stereo width, dynamics, gain and a limiter, on interleaved stereo
-/// samples, in place. Changes are spread over some milliseconds, so that none is heard as a click.
-/// When it has nothing to do, the samples stay as they are, bit by bit.
+/// Stereo width, dynamics and gain, on interleaved stereo samples, in place. Changes are spread over
+/// some milliseconds, so that none is heard as a click. When it has nothing to do, the samples stay
+/// as they are, bit by bit.
 class Finish {
  public:
   /// As they are, nothing changes.
@@ -20,11 +20,10 @@ class Finish {
   /// To be called before the first samples.
   void SetRate(int samplesPerSecond);
 
-  /// \param mayBeLouder the stages in front change the sound, so that the limiter has to watch it
-  void MoveTo(const Parameters& target, bool mayBeLouder);
+  void MoveTo(const Parameters& target);
 
   /// Goes there at once, because a new sound begins.
-  void BeginAt(const Parameters& target, bool mayBeLouder);
+  void BeginAt(const Parameters& target);
 
   /// \return whether `Process` would change nothing
   bool IsResting() const { return isResting_; }
@@ -35,15 +34,12 @@ class Finish {
   void Glide();
   void Settle();
   float Compress(float peak);
-  float Limit(float peak);
 
   Parameters target_;
   Parameters now_;
-  bool mayBeLouder_ = false;
-  float envelope_ = 0;   // the sound's level as the dynamics see it
-  float reduction_ = 1;  // the limiter's gain
+  float envelope_ = 0;  // the sound's level as the dynamics see it
   bool isResting_ = true;
-  // Shares of the way that are gone in one frame.
+  // Smoothing coefficients, for a step of one frame.
   float glide_ = 1;
   float attack_ = 1;
   float release_ = 1;

@@ -1,10 +1,11 @@
 /// \file
 #pragma once
 
-#include "../Gst.h"
 #include "Finish.h"
+#include "Limiter.h"
 #include "Presets.h"
 #include "Settings.h"
+#include "desktop/player/Gst.h"
 
 #include <array>
 
@@ -15,7 +16,7 @@ bool IsEffectSupported(int effect);
 bool IsPresetSupported(int preset);
 
 /// An element that gives a pipeline's sound its effects: an equalizer for presets, bass and treble,
-/// a reverb, and behind them what GStreamer has no good element for. It takes any sound and gives
+/// a reverb, what GStreamer has no good element for, and a limiter. It takes any sound and gives
 /// stereo in floating point, in which nothing can be clipped between the stages. It is meant to be
 /// in the pipeline from the start: neutral settings cost next to nothing and change nothing.
 class EffectChain {
@@ -51,7 +52,7 @@ class EffectChain {
     double gain = 0;
   };
 
-  GstElement* Append(const char* factory);
+  GstElement* Append(ElementPtr element);
   void AddEqualizer();
   void AddReverb();
   void Observe(GstElement* element, int what, GstPadProbeCallback callback);
@@ -76,6 +77,7 @@ class EffectChain {
   bool isBeginning_ = true;
   double reverbShare_ = 0;
   Finish finish_;
+  Limiter limiter_;
 };
 
 }  // namespace Desktop

@@ -33,6 +33,22 @@ PipelineWatch::Answer PipelineWatch::WaitForAnswer(std::chrono::milliseconds lim
   return answer_;
 }
 
+bool PipelineWatch::WaitForEnd(std::chrono::milliseconds limit) {
+  std::unique_lock lock(mutex_);
+  return answered_.wait_for(lock, limit,
+                            [this] { return hasEnded_ || answer_ == Answer::kFailed; });
+}
+
+bool PipelineWatch::HasEnded() const {
+  std::lock_guard lock(mutex_);
+  return hasEnded_;
+}
+
+void PipelineWatch::ForgetEnd() {
+  std::lock_guard lock(mutex_);
+  hasEnded_ = false;
+}
+
 bool PipelineWatch::HasFailed() const {
   std::lock_guard lock(mutex_);
   return answer_ == Answer::kFailed;
@@ -55,8 +71,8 @@ GstBusSyncReply PipelineWatch::OnMessage(GstBus*, GstMessage* message, gpointer 
 
 void PipelineWatch::Read(GstMessage* message) {
   switch (GST_MESSAGE_TYPE(message)) {
-    case GST_MESSAGE_ASYNC_DONE:
-    case GST_MESSAGE_EOS: SetAnswer(Answer::kDone); break;
+    case GST_MESSAGE_ASYNC_DONE: SetDone(false); break;
+    case GST_MESSAGE_EOS: SetDone(true); break;
     case GST_MESSAGE_ERROR: ReadError(message); break;
     case GST_MESSAGE_ELEMENT: ReadMissingPlugin(message); break;
     default: break;
@@ -84,10 +100,11 @@ void PipelineWatch::ReadMissingPlugin(GstMessage* message) {
   missingPlugin_ = description.get();
 }
 
-void PipelineWatch::SetAnswer(Answer answer) {
+void PipelineWatch::SetDone(bool isEnd) {
   std::lock_guard lock(mutex_);
   if (answer_ == Answer::kFailed) return;
-  answer_ = answer;
+  answer_ = Answer::kDone;
+  hasEnded_ = hasEnded_ || isEnd;
   answered_.notify_all();
 }
 

@@ -37,6 +37,16 @@ class PipelineWatch {
   /// \return `kNone` when nothing of this happened within \p limit
   Answer WaitForAnswer(std::chrono::milliseconds limit);
 
+  /// Waits until everything has been played, or played no further because of a failure.
+  /// \return false when neither happened within \p limit
+  bool WaitForEnd(std::chrono::milliseconds limit);
+
+  /// \return whether everything has been played since the last `ForgetEnd`.
+  bool HasEnded() const;
+
+  /// To be called before what begins elsewhere in the file.
+  void ForgetEnd();
+
   bool HasFailed() const;
   Failure GetFailure() const;
 
@@ -45,12 +55,13 @@ class PipelineWatch {
   void Read(GstMessage* message);
   void ReadError(GstMessage* message);
   void ReadMissingPlugin(GstMessage* message);
-  void SetAnswer(Answer answer);
+  void SetDone(bool isEnd);
 
   const BusPtr bus_;
   mutable std::mutex mutex_;  // never held while GStreamer is called
   std::condition_variable answered_;
   Answer answer_ = Answer::kNone;
+  bool hasEnded_ = false;
   Failure failure_;
   std::string missingPlugin_;
 };

@@ -1,9 +1,9 @@
 #include "RenderAudio.h"
 
-#include "../../media/PlayerError.h"
-#include "../Gst.h"
-#include "../PipelineWatch.h"
 #include "Chain.h"
+#include "desktop/player/Gst.h"
+#include "desktop/player/PipelineWatch.h"
+#include "native/PlayerError.h"
 
 #include <sys/stat.h>
 #include <unistd.h>

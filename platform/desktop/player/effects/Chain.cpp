@@ -1,6 +1,6 @@
 #include "Chain.h"
 
-#include "../../media/PlayerError.h"
+#include "native/PlayerError.h"
 
 #include <Tizen/Base/Log.h>
 #include <gst/base/gstbasetransform.h>
@@ -23,8 +23,8 @@ constexpr double kShelfWidth = 1.6;
 constexpr double kBassFrequency = 250;
 constexpr double kTrebleFrequency = 4000;
 
-/// Of the rate of samples. Above the first, the equalizer takes a band for the whole range; above the
-/// second, a shelf.
+/// As shares of the sample rate: the highest frequencies at which the equalizer's bands and shelves
+/// keep their shape.
 constexpr double kHighestBand = 0.45;
 constexpr double kHighestShelf = 1.0 / 6;
 
@@ -88,8 +88,8 @@ bool IsPresetSupported(int preset) {
 
 EffectChain::EffectChain(const SharedSettings& settings)
     : settings_(settings), bin_(GST_ELEMENT(gst_object_ref_sink(gst_bin_new("effects")))) {
-  GstElement* converter = Append("audioconvert");
-  GstElement* format = Append("capsfilter");
+  GstElement* converter = Append(MakeElement("audioconvert"));
+  GstElement* format = Append(MakeElement("capsfilter"));
   if (converter == nullptr || format == nullptr) {
     bin_.reset();
     return;
@@ -101,22 +101,22 @@ EffectChain::EffectChain(const SharedSettings& settings)
   if (HasEqualizer()) AddEqualizer();
   if (HasReverb()) AddReverb();
   Observe(last_, GST_PAD_PROBE_TYPE_BUFFER, OnOutput);
+  if (GstElement* limiter = Append(Limiter::MakeElement())) limiter_.Attach(limiter);
   Expose(converter, "sink");
   Expose(last_, "src");
 }
 
-/// \return a new element at the end of the chain, owned by the bin, or null.
-GstElement* EffectChain::Append(const char* factory) {
-  GstElement* element = gst_element_factory_make(factory, nullptr);
+/// \return \p element, at the end of the chain and owned by the bin, or null if it is.
+GstElement* EffectChain::Append(ElementPtr element) {
   if (element == nullptr) return nullptr;
-  gst_bin_add(GST_BIN(bin_.get()), element);
-  if (last_ != nullptr) gst_element_link(last_, element);
-  last_ = element;
-  return element;
+  gst_bin_add(GST_BIN(bin_.get()), element.get());
+  if (last_ != nullptr) gst_element_link(last_, element.get());
+  last_ = element.get();
+  return last_;
 }
 
 void EffectChain::AddEqualizer() {
-  GstElement* equalizer = Append(kEqualizerFactory);
+  GstElement* equalizer = Append(MakeElement(kEqualizerFactory));
   if (equalizer == nullptr) return;
   g_object_set(equalizer, "num-bands", static_cast<guint>(kBands), nullptr);
   for (std::size_t i = 0; i < kBands; ++i) {
@@ -130,7 +130,7 @@ void EffectChain::AddEqualizer() {
 }
 
 void EffectChain::AddReverb() {
-  reverb_ = Append(kReverbFactory);
+  reverb_ = Append(MakeElement(kReverbFactory));
   if (reverb_ == nullptr) return;
   g_object_set(reverb_, "level", 0.0, "room-size", kRoomSize, "damping", kDamping, nullptr);
   gst_base_transform_set_passthrough(GST_BASE_TRANSFORM(reverb_), TRUE);
@@ -190,12 +190,8 @@ void EffectChain::Follow() {
     bands_[i].MoveTo(target.gains[i], isBeginning_ ? kAtOnce : step);
   }
   MoveReverb(target.reverb, isBeginning_ ? kAtOnce : kReverbStep);
-  const bool mayBeLouder = reverbShare_ != 0 || !IsEqualizerResting();
-  if (isBeginning_) {
-    finish_.BeginAt(target.finish, mayBeLouder);
-  } else {
-    finish_.MoveTo(target.finish, mayBeLouder);
-  }
+  isBeginning_ ? finish_.BeginAt(target.finish) : finish_.MoveTo(target.finish);
+  limiter_.SetActive(!IsEqualizerResting() || reverbShare_ != 0 || !finish_.IsResting());
   isBeginning_ = false;
 }
 
@@ -213,7 +209,7 @@ EffectChain::Target EffectChain::FindTarget(const EffectSettings& settings) cons
     target.reverb = percent * kHighestReverbShare / 100;
   }
   // The reverb lowers what it is added to.
-  const double gain = std::pow(10, -PeakGain(preset) / 20) / (1 - target.reverb);
+  const double gain = std::pow(10, preset.gain / 20) / (1 - target.reverb);
   target.finish.gain = static_cast<float>(gain);
   target.finish.sideGain =
       static_cast<float>(1 + (kHighestSideGain - 1) * settings.Level(kStereoWidth) / 100);

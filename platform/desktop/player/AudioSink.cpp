@@ -1,13 +1,15 @@
 #include "AudioSink.h"
 
-#include "sound/Session.h"
+#include "desktop/sound/Session.h"
 
 #include <gst/base/gstbasesink.h>
 #include <pulse/pulseaudio.h>
 
 #include <algorithm>
+#include <atomic>
 #include <chrono>
 #include <cstring>
+#include <string>
 #include <thread>
 
 namespace Desktop {
@@ -110,9 +112,20 @@ GstPadProbeReturn OnSound(GstPad* pad, GstPadProbeInfo* info, gpointer data) {
   return GST_PAD_PROBE_OK;
 }
 
+/// A name of its own for each sink: sinks of one name share a connection, and with it the end of a
+/// server, which would keep new ones from the next server.
+std::string MakeClientName() {
+  static std::atomic<unsigned> last{0};
+  const char* program = g_get_prgname();
+  const std::string name = program != nullptr ? program : "zelkora";
+  const unsigned number = ++last;
+  return number == 1 ? name : name + " " + std::to_string(number);
+}
+
 ElementPtr MakePulseSink() {
   ElementPtr sink = MakeElement("pulsesink");
   if (sink == nullptr) return nullptr;
+  g_object_set(sink.get(), "client-name", MakeClientName().c_str(), nullptr);
   SetStreamProperties(sink.get(), GetPlayerRole());
   const PadPtr pad(gst_element_get_static_pad(sink.get(), "sink"));
   gst_pad_add_probe(pad.get(), GST_PAD_PROBE_TYPE_BUFFER, OnSound, sink.get(), nullptr);

@@ -2,7 +2,7 @@
 /// Owners of GStreamer's and GLib's things.
 #pragma once
 
-#include "FreeWith.h"
+#include "desktop/FreeWith.h"
 
 #include <gst/gst.h>
 
@@ -10,11 +10,20 @@
 
 namespace Desktop {
 
+/// For what GStreamer itself frees by inline functions.
+struct Unref {
+  template <typename T>
+  void operator()(T* thing) const {
+    gst_mini_object_unref(GST_MINI_OBJECT_CAST(thing));
+  }
+};
+
 using ElementPtr = std::unique_ptr<GstElement, FreeWith<gst_object_unref>>;
 using BusPtr = std::unique_ptr<GstBus, FreeWith<gst_object_unref>>;
 using PadPtr = std::unique_ptr<GstPad, FreeWith<gst_object_unref>>;
-using SamplePtr = std::unique_ptr<GstSample, FreeWith<gst_sample_unref>>;
-using CapsPtr = std::unique_ptr<GstCaps, FreeWith<gst_caps_unref>>;
+using SamplePtr = std::unique_ptr<GstSample, Unref>;
+using CapsPtr = std::unique_ptr<GstCaps, Unref>;
+using TagsPtr = std::unique_ptr<GstTagList, Unref>;
 using ErrorPtr = std::unique_ptr<GError, FreeWith<g_error_free>>;
 using TextPtr = std::unique_ptr<char, FreeWith<g_free>>;
 

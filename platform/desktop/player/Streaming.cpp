@@ -24,7 +24,30 @@ int IsIdleElement(gconstpointer value, gconstpointer) {
   return HasAny(pads.get(), IsIdlePad) ? 0 : 1;
 }
 
+/// What only reads the tags around a file is a demuxer to GStreamer too.
+int IsNoDemuxer(gconstpointer value, gconstpointer) {
+  auto* element = GST_ELEMENT(g_value_get_object(static_cast<const GValue*>(value)));
+  GstElementFactory* factory = gst_element_get_factory(element);
+  if (factory == nullptr) return 1;
+  const bool isDemuxer =
+      gst_element_factory_list_is_type(factory, GST_ELEMENT_FACTORY_TYPE_DEMUXER) &&
+      !gst_element_factory_list_is_type(factory, GST_ELEMENT_FACTORY_TYPE_MEDIA_METADATA);
+  return isDemuxer ? 0 : 1;
+}
+
 }  // namespace
+
+std::string FindDemuxer(GstElement* pipeline) {
+  const IteratorPtr elements(gst_bin_iterate_recurse(GST_BIN(pipeline)));
+  GValue found = G_VALUE_INIT;
+  std::string name;
+  if (gst_iterator_find_custom(elements.get(), IsNoDemuxer, &found, nullptr)) {
+    auto* demuxer = GST_ELEMENT(g_value_get_object(&found));
+    name = GST_OBJECT_NAME(gst_element_get_factory(demuxer));
+    g_value_unset(&found);
+  }
+  return name;
+}
 
 bool IsStreaming(GstElement* pipeline) {
   const IteratorPtr elements(gst_bin_iterate_recurse(GST_BIN(pipeline)));

@@ -1,0 +1,58 @@
+#include "Film.h"
+
+#include "Container.h"
+#include "native/PlayerError.h"
+
+#include <Tizen/Base/Log.h>
+
+namespace Desktop {
+namespace {
+
+/// A seek that waits longer feels like none.
+constexpr std::chrono::seconds kIndexLimit{5};
+
+}  // namespace
+
+Film::Film(const char* path, const std::atomic<int>& isUnwanted)
+    : path_(path), isUnwanted_(isUnwanted) {}
+
+void Film::SetContainer(const std::string& demuxer, FilmTime first, FilmTime shift) {
+  isTrusted_ = HasTrustedIndex(demuxer, path_.c_str());
+  if (HasOwnOrigin(demuxer)) origin_ = first;
+  if (IsLostBefore(demuxer)) floor_ = first;
+  if (CountsFromZero(demuxer)) excess_ = shift;
+}
+
+FilmTime Film::FindDuration(FilmTime told) {
+  if (isTrusted_) return told - excess_;
+  const KeyFrameIndex* index = FindIndex();
+  return index == nullptr ? told : index->end - GetOrigin();
+}
+
+TimeSpan Film::GetSpan(FilmTime keyFrame) const {
+  TimeSpan span = Around(keyFrame);
+  if (!HasTrueFlags() || !index_ || index_->keyFrames.size() < 2) return span;
+  if (span.Holds(index_->keyFrames[0])) span.to = index_->keyFrames[1] - kRounding;
+  return span;
+}
+
+const KeyFrameIndex* Film::FindIndex() {
+  if (!index_ && !isGivenUp_) {
+    index_ = ReadKeyFrames(path_.c_str(), kIndexLimit, isUnwanted_);
+    isGivenUp_ = !index_;
+    if (isGivenUp_ && isUnwanted_ == 0) {
+      SysLogInternal(Host::kPlayerModule, "", __LINE__,
+                     "\"%s\" says nothing of its key frames, and reading all of it takes too long: "
+                     "seeks land where its container can tell",
+                     path_.c_str());
+    }
+  }
+  return index_ && !index_->keyFrames.empty() ? &*index_ : nullptr;
+}
+
+const KeyFrameIndex* Film::FindIndexAtAnyRate() {
+  if (!index_) index_ = ReadKeyFrames(path_.c_str(), std::nullopt, isUnwanted_);
+  return GetIndex();
+}
+
+}  // namespace Desktop

@@ -1,0 +1,53 @@
+/// \file
+#pragma once
+
+#include "Film.h"
+#include "Pipeline.h"
+
+#include <optional>
+
+namespace Desktop {
+
+/// Where a seek to a key frame came.
+struct Landed {
+  FilmTime time;  ///< of the picture, in the container's time
+  bool isKeyFrame;
+  bool inTrickMode;  ///< only key frames come until another seek
+  FilmTime begin;    ///< where the pipeline's clock stands: before the picture when it had to
+};
+
+/// Brings a pipeline to the last key frame at or before a time, or to the first one of all. Where
+/// the container can be trusted that is one seek, which decodes the key frame only; else the film's
+/// index says which it is, and the gate before the decoder that the picture is that one.
+class Landing {
+ public:
+  Landing(Pipeline& pipeline, Film& film) : pipeline_(pipeline), film_(film) {}
+
+  /// \param landed receives where the pipeline is then; untouched on failure
+  int LandAtOrBefore(FilmTime time, std::optional<Landed>* landed);
+
+  /// Goes there once more, so that all frames come after it.
+  int Repeat(const Landed& landed, std::optional<Landed>* again);
+
+  /// Goes to the time itself.
+  int GoTo(FilmTime time);
+
+  /// \return whether the picture that is shown since the last seek is a key frame.
+  bool IsOnKeyFrame() const;
+
+ private:
+  int TryContainer(FilmTime time, std::optional<Landed>* landed);
+  int LandByIndex(FilmTime time, std::optional<Landed>* landed);
+  int LandAt(FilmTime keyFrame, std::optional<Landed>* landed);
+  int LandSomewhere(FilmTime time, std::optional<Landed>* landed);
+  int Seek(FilmTime time, GstSeekFlags manner, std::optional<TimeSpan> first);
+  bool IsAtGate() const;
+  bool IsFirst(FilmTime keyFrame) const;
+  bool IsKeyFrame(const Shown& shown) const;
+
+  Pipeline& pipeline_;
+  Film& film_;
+  FilmTime lead_ = 0;  // how much earlier a seek of this file has to begin
+};
+
+}  // namespace Desktop

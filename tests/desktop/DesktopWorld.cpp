@@ -32,10 +32,13 @@ struct Others {
     sinkModule = LoadSink("first");
   }
 
+  /// Returns when the device knows the player too: of one that has gone by then nothing is heard.
   const Player& Play(const std::string& role) {
     const auto found = players.find(role);
     if (found != players.end()) return found->second;
-    return players.emplace(role, Player({"media.role=" + role})).first->second;
+    const Player& player = players.emplace(role, Player({"media.role=" + role})).first->second;
+    Host::WaitUntilDelivered();
+    return player;
   }
 
   /// Returns when the server knows that it has ended.

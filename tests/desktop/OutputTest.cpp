@@ -1,6 +1,9 @@
 // Null sinks have no ports, so what the server would tell of headphones is made up here.
 
-#include "desktop/sound/Output.h"
+#include "desktop/sound/Interruptions.h"
+#include "native/Callbacks.h"
+
+#include <sound_manager.h>
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -25,7 +28,7 @@ void Tell(Output& output, int headphones, bool isSpeakerActive) {
   sink.n_ports = 2;
   sink.ports = list;
   sink.active_port = list[isSpeakerActive ? 1 : 0];
-  output.OnTold(sink);
+  output.Put(sink);
 }
 
 TEST(Headphones, DisruptWhenTheyAreUnpluggedAndOnlyThen) {
@@ -43,18 +46,21 @@ TEST(Headphones, DisruptWhenTheyAreUnpluggedAndOnlyThen) {
       {"left for the speaker, having been unplugged before", kNo, kNo, true, false},
       {"not watched", kUnknown, kUnknown, false, false},
   };
-  static auto& reports = *new Reports;  // isn't made to be destroyed
+  Reports reports;
   for (const auto& row : rows) {
     std::vector<int> codes;
     const Streams streams;
     Output output(reports, streams);
-    reports.Set(Host::Kind::kInterruption,
-                [&](const Host::Report& report) { codes.push_back(report.first); });
+    const sound_manager_session_interrupted_cb callback = [](int code, void* data) {
+      static_cast<std::vector<int>*>(data)->push_back(code);
+    };
+    Native::SetCallback(Native::Kind::kInterruption, reinterpret_cast<Native::Callback>(callback),
+                        &codes);
     Tell(output, row.before, false);
     for (int i = 0; i < 2; ++i) Tell(output, row.after, row.goesToSpeaker);
-    reports.AwaitCallbacks();
+    Native::WaitUntilReported();
     EXPECT_EQ(codes, row.disrupts ? std::vector<int>{3} : std::vector<int>{}) << row.name;
-    reports.Unset(Host::Kind::kInterruption);
+    Native::UnsetCallback(Native::Kind::kInterruption);
   }
 }
 

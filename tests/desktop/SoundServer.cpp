@@ -7,10 +7,14 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <algorithm>
+#include <chrono>
 #include <csignal>
 #include <cstdlib>
 #include <filesystem>
+#include <sstream>
 #include <stdexcept>
+#include <thread>
 #include <utility>
 
 namespace {
@@ -35,8 +39,11 @@ std::string MakeHome() {
 /// \return the directory of this process's server, made at the first use and removed at exit.
 const std::string& Home() {
   static const struct Directory {
-    ~Directory() { std::filesystem::remove_all(path); }
+    ~Directory() {
+      if (getpid() == process) std::filesystem::remove_all(path);
+    }
     const std::string path = MakeHome();
+    const pid_t process = getpid();  // not a child that it forks
   } home;
   return home.path;
 }
@@ -71,9 +78,12 @@ ListedStream ParseStream(const std::string& description) {
   ListedStream stream;
   stream.description = description;
   stream.index = std::stoi(description);
-  const std::size_t volume = description.find("Volume: ");  // "Volume: mono: 39322 /  60% ..."
-  if (volume != std::string::npos) {
-    stream.volume = std::stoi(description.substr(description.find(": ", volume + 8) + 2));
+  // "Volume: front-left: 39322 /  60% / -13.31 dB,   front-right: ..."
+  const std::size_t volume = description.find("Volume: ");
+  std::istringstream channels(description.substr(volume, description.find('\n', volume) - volume));
+  for (std::string word; channels >> word;) {
+    const bool isVolume = word.find_first_not_of("0123456789") == std::string::npos;
+    if (isVolume) stream.volume = std::max(stream.volume, std::stoi(word));
   }
   stream.isCorked = description.find("Corked: yes") != std::string::npos;
   return stream;
@@ -152,18 +162,36 @@ void SoundServer::ForgetVolumes() { std::filesystem::remove_all(Home() + "/state
 
 SoundServer::~SoundServer() { Kill(); }
 
+bool IsOnPipeWire() { return std::getenv("ZELKORA_TEST_PIPEWIRE") != nullptr; }
+
 void SoundServer::Start() {
+  if (IsOnPipeWire()) return StartPipeWire();
   std::vector<std::string> command = {"pulseaudio", "-n", "--daemonize=no", "--exit-idle-time=-1",
                                       "--log-target=null"};
   for (const std::string& module : modules_) command.insert(command.end(), {"-L", module});
   ReadySocket ready;
-  process_.emplace_back(std::move(command));
+  processes_.emplace_back(std::move(command));
   Require(ready.Wait(), "the sound server doesn't start");
 }
 
-void SoundServer::Kill() { process_.clear(); }
+/// PipeWire's session manager ends without a message bus.
+void SoundServer::StartPipeWire() {
+  const std::string bus = "unix:path=" + Home() + "/bus";
+  setenv("DBUS_SESSION_BUS_ADDRESS", bus.c_str(), 1);
+  setenv("PULSE_SERVER", ("unix:" + Home() + "/pulse/native").c_str(), 1);
+  processes_.emplace_back(
+      std::vector<std::string>{"dbus-daemon", "--session", "--nofork", "--address=" + bus});
+  for (const char* program : {"pipewire", "wireplumber", "pipewire-pulse"}) {
+    processes_.emplace_back(std::vector<std::string>{program});
+    std::this_thread::sleep_for(std::chrono::milliseconds(500));
+  }
+  Pactl({"load-module", "module-null-sink", "sink_name=first"});
+  while (Pactl({"get-default-sink"}) != "first\n") Pactl({"set-default-sink", "first"});
+}
 
-void SoundServer::Signal(int signal) const { process_.front().Signal(signal); }
+void SoundServer::Kill() { processes_.clear(); }
+
+void SoundServer::Signal(int signal) const { processes_.back().Signal(signal); }
 
 namespace {
 
@@ -203,8 +231,13 @@ namespace {
 
 int lastPlayer = 0;
 
-std::vector<std::string> MakePlayerCommand(const std::vector<std::string>& properties) {
-  std::vector<std::string> command = {"pacat", "--raw", "--latency-msec=50", "/dev/zero",
+std::vector<std::string> MakePlayerCommand(const std::vector<std::string>& properties,
+                                           int channels) {
+  std::vector<std::string> command = {"pacat",
+                                      "--raw",
+                                      "--latency-msec=50",
+                                      "/dev/zero",
+                                      "--channels=" + std::to_string(channels),
                                       "--property=test.player=" + std::to_string(++lastPlayer)};
   for (const std::string& property : properties) command.push_back("--property=" + property);
   return command;
@@ -212,7 +245,8 @@ std::vector<std::string> MakePlayerCommand(const std::vector<std::string>& prope
 
 }  // namespace
 
-Player::Player(std::vector<std::string> properties) : Program(MakePlayerCommand(properties)) {
+Player::Player(std::vector<std::string> properties, int channels)
+    : Program(MakePlayerCommand(properties, channels)) {
   const std::string mark = "test.player = \"" + std::to_string(lastPlayer) + "\"";
   // Each look is a round trip to the server, which makes the stream meanwhile.
   for (int look = 0; look < 1000 && index_ < 0; ++look) {

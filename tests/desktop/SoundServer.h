@@ -42,7 +42,10 @@ class Program {
   int status_ = 0;
 };
 
-/// A PulseAudio with a null sink, in directories of its own. Points this process, and the programs
+/// \return whether the server is a PipeWire, as the environment variable ZELKORA_TEST_PIPEWIRE asks
+bool IsOnPipeWire();
+
+/// A PulseAudio or PipeWire with a null sink, in directories of its own. Points this process, and the programs
 /// that it starts, to the server. Running or not, it has always the same address.
 class SoundServer {
  public:
@@ -67,14 +70,16 @@ class SoundServer {
   void Signal(int signal) const;
 
  private:
+  void StartPipeWire();
+
   std::vector<std::string> modules_;
-  std::vector<Program> process_;  // one at most
+  std::vector<Program> processes_;  // one, or PipeWire's
 };
 
 /// What `pactl` tells of a playback stream.
 struct ListedStream {
   int index = -1;
-  int volume = -1;  ///< 65536 is 100 %
+  int volume = -1;  ///< of the loudest channel; 65536 is 100 %
   bool isCorked = false;
   std::string description;  ///< all of it
 };
@@ -92,7 +97,7 @@ std::vector<ListedStream> ListStreams(const std::string& line);
 /// \param properties the stream's, as "key=value"
 class Player : public Program {
  public:
-  explicit Player(std::vector<std::string> properties);
+  explicit Player(std::vector<std::string> properties, int channels = 2);
 
   int GetIndex() const { return index_; }
 

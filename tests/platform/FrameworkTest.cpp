@@ -1,5 +1,7 @@
 // What the library relies on in the application framework: results, log, assertions, capabilities.
 
+#include "support/OwnProcess.h"
+
 #include <Host/Calls.h>
 #include <Host/Log.h>
 #include <Tizen/Base/Log.h>
@@ -9,6 +11,7 @@
 
 #include <gtest/gtest.h>
 
+#include <cstdlib>
 #include <string>
 #include <thread>
 
@@ -33,6 +36,17 @@ TEST(LogLine, TellsAllThereIsAndThePlatformFamilysFailureAloneIsTheThreadsLastRe
   EXPECT_EQ(GetLastResult(), 0xA0ABCDEF);
   Logged([] { SysTryReturnResultInternal(80, E_INVALID_STATE, "", 1, "a"); });
   EXPECT_EQ(GetLastResult(), E_INVALID_STATE);
+}
+
+TEST(LogReason, IsWrittenOnRequestOnlyAndTheLastResultStays) {
+  const auto log = [] { Host::LogReason(60, E_INVALID_ARG, 3, "because of %s", "it"); };
+  InOwnProcess([=] {
+    setenv("ZELKORA_LOG", "debug", 1);
+    EXPECT_EQ(Logged(log), "zelkora debug module=60 result=E_INVALID_ARG line=3: because of it\n");
+  });
+  SetLastResult(E_SYSTEM);
+  EXPECT_EQ(Logged(log), "");
+  EXPECT_EQ(GetLastResult(), E_SYSTEM);
 }
 
 TEST(LogSink, TakesTheLinesUntilItIsRemovedAndMayLogItself) {

@@ -1,39 +1,41 @@
 #include "Allocations.h"
 
 #include <atomic>
-#include <cstdint>
 #include <cstdlib>
 #include <new>
 
 namespace {
 
-thread_local std::size_t count = 0;
-thread_local std::size_t untilFailure = 0;  // 0: none fails
-thread_local bool failed = false;
-
-std::atomic<std::ptrdiff_t> librarySpared{PTRDIFF_MAX};  // the library's are those that don't throw
+std::atomic<std::size_t> count{0};
 std::atomic<std::ptrdiff_t> live{0};
 
-void* Allocate(std::size_t size) {
+std::atomic<bool> isArmed{false};
+std::atomic<std::ptrdiff_t> passed{0};  // of those that may fail
+std::ptrdiff_t firstFailing = 0, failures = 0;
+FailingAllocation::Whose whoseFail = FailingAllocation::kAnyones;
+
+bool Fails(FailingAllocation::Whose whose) {
+  if (!isArmed || whose < whoseFail) return false;
+  const std::ptrdiff_t number = passed++;
+  return number >= firstFailing && number - firstFailing < failures;
+}
+
+void* Allocate(std::size_t size, FailingAllocation::Whose whose) {
   ++count;
-  if (untilFailure > 0 && --untilFailure == 0) {
-    failed = true;
-    return nullptr;
-  }
+  if (Fails(whose)) return nullptr;
   live.fetch_add(1, std::memory_order_relaxed);
   return std::malloc(size);
 }
 
 }  // namespace
 
-// Arrays are left alone: nobody makes them.
 void* operator new(std::size_t size) {
-  void* memory = Allocate(size);
+  void* memory = Allocate(size, FailingAllocation::kAnyones);
   if (memory == nullptr) throw std::bad_alloc();
   return memory;
 }
 void* operator new(std::size_t size, const std::nothrow_t&) noexcept {
-  return librarySpared.fetch_sub(1) > 0 ? Allocate(size) : nullptr;
+  return Allocate(size, FailingAllocation::kLibrarys);
 }
 void operator delete(void* memory) noexcept {
   if (memory != nullptr) live.fetch_sub(1, std::memory_order_relaxed);
@@ -45,17 +47,14 @@ std::size_t CountAllocations() { return count; }
 
 std::ptrdiff_t CountLiveAllocations() { return live; }
 
-FailingAllocation::FailingAllocation(std::size_t nth) {
-  untilFailure = nth;
-  failed = false;
+FailingAllocation::FailingAllocation(std::ptrdiff_t spared, Whose whose, std::ptrdiff_t times) {
+  firstFailing = spared;
+  failures = times;
+  whoseFail = whose;
+  passed = 0;
+  isArmed = true;
 }
 
-FailingAllocation::~FailingAllocation() { untilFailure = 0; }
+FailingAllocation::~FailingAllocation() { isArmed = false; }
 
-bool FailingAllocation::HasFailed() const { return failed; }
-
-FailingLibraryAllocation::FailingLibraryAllocation(std::ptrdiff_t spared) {
-  librarySpared = spared;
-}
-
-FailingLibraryAllocation::~FailingLibraryAllocation() { librarySpared = PTRDIFF_MAX; }
+bool FailingAllocation::HasFailed() const { return passed > firstFailing; }

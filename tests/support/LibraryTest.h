@@ -17,19 +17,6 @@ inline constexpr result kUntouched = 0xBEEF;
 /// A result that has no name.
 inline constexpr result kForeign = 0xA0001234;
 
-/// \return the text with the result's name in brackets in front, as "[%s]..." is filled.
-inline std::string Named(result r, const std::string& text) {
-  return "[" + std::string(GetErrorMessage(r)) + "]" + text;
-}
-
-/// What comes of the answers to a feature query.
-inline constexpr struct {
-  result answer, expected;
-} kFeatureRefusals[] = {{Host::kFeatureAbsent, E_UNSUPPORTED_OPERATION},
-                        {E_OBJ_NOT_FOUND, E_UNSUPPORTED_OPERATION},
-                        {E_SYSTEM, E_SYSTEM},
-                        {kForeign, kForeign}};
-
 /// A test of the library on a fresh device, with log and platform calls captured and
 /// assertions returning.
 class LibraryTest : public testing::Test {

@@ -16,29 +16,19 @@ class LogCapture {
   LogCapture() { Host::SetLogSink(&LogCapture::Receive, this); }
   ~LogCapture() { Host::SetLogSink(nullptr, nullptr); }
 
-  /// \return the lines since the last call, in order, as `Sys`, `SysPlain`, `App` and their like
-  /// write them.
+  /// \return the lines since the last call, in order: "80: text", "80 info: text",
+  /// "ZELKORA_MEDIA: text", "assertion: text". A result that the text doesn't name stands before the
+  /// colon.
   Lines Take();
+
+  /// The one that lines of the application family must be signed with, if any.
+  std::string operation;
 
  private:
   static void Receive(const Host::LogRecord& record, void* context);
 
+  std::string Text(const Host::LogRecord& record) const;
+
   std::mutex mutex_;
   Lines lines_;
 };
-
-/// A line of the platform family's exception log: module 80, no function name.
-std::string Sys(result r, const std::string& message);
-
-/// A line of the platform family without a result.
-std::string SysPlain(const std::string& message);
-
-/// A line of the application family's exception log, under the library's tag.
-std::string App(const std::string& function, const std::string& message);
-
-/// An informational line of the application family, under the library's tag.
-std::string AppInfo(const std::string& function, const std::string& message);
-
-/// A report of an assertion; the platform family names no function.
-std::string Assertion(const std::string& function, const std::string& condition,
-                      const std::string& message);

@@ -1,14 +1,20 @@
 // Runs the command-line program and the device script the way a user does.
 
+#include "base/Managers.h"
+#include "base/Recording.h"
+
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
+#include <sound_manager.h>
 #include <sys/wait.h>
+#include <unistd.h>
 
 #include <algorithm>
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
 #include <iterator>
+#include <sstream>
 #include <string>
 #include <tuple>
 
@@ -16,7 +22,10 @@ namespace {
 
 namespace fs = std::filesystem;
 using testing::AllOf;
+using testing::ContainsRegex;
+using testing::EndsWith;
 using testing::HasSubstr;
+using testing::Not;
 using testing::StartsWith;
 using Text = testing::Matcher<const std::string&>;
 
@@ -26,7 +35,7 @@ std::string Read(const fs::path& path) {
 }
 
 /// Each test has an empty folder of its own to run in. "$Z" runs the program on the simulated
-/// device.
+/// device, "$D" on the desktop one.
 class CommandLine : public testing::Test {
  protected:
   CommandLine() {
@@ -34,6 +43,7 @@ class CommandLine : public testing::Test {
     setenv("ASAN_OPTIONS", "fast_unwind_on_malloc=0", 0);  // those libraries have no frame pointers
     setenv("TSAN_OPTIONS", "ignore_noninstrumented_modules=1:suppressions=" RACES_OF_OTHERS, 0);
     setenv("Z", PROGRAM " --device simulated", 1);
+    setenv("D", PROGRAM " --device desktop", 1);
     std::string pattern = fs::temp_directory_path() / "zelkora-XXXXXX";
     base_ = mkdtemp(pattern.data());
     fs::create_directory(folder_ = base_ / "folder");
@@ -64,11 +74,19 @@ TEST_F(CommandLine, UsageAndVersionArePrintedWithSuccess) {
 TEST_F(CommandLine, UsageThatIsWrongIsExplainedOnStandardErrorAndExitsWith2) {
   for (const auto& [options, reason] : {std::pair{"", "no command"},
                                         {"frob", "frob"},
-                                        {"seek a.mp4", "MS"},
-                                        {"seek a.mp4 1:30", "'1:30'"},
+                                        {"seek a.mp4", "POSITION"},
+                                        {"seek a.mp4 1.5", "1.5s"},
+                                        {"seek a.mp4 1:60", "'1:60'"},
+                                        {"seek a.mp4 1:2:3:4", "'1:2:3:4'"},
+                                        {"seek a.mp4 1 --x", "no option '--x'"},
+                                        {"filmstrip a.mp4 b open", "'b open'"},
+                                        {"filmstrip a.mp4 -o a.jpg", "'a.jpg' doesn't end in .png"},
+                                        {"monitor --count 0", "'0' is no whole number from 1"},
                                         {"filmstrip a.mp4 -n 501", "1 to 500"},
                                         {"volume medi", "system, notification"},
-                                        {"volume media x", "LEVEL"},
+                                        {"volume media x", "write 9, +1, -2 or 60%"},
+                                        {"volume media +5%", "write 9"},
+                                        {"frob a b", "no command 'frob'"},
                                         {"call --mode voice media", "--for"},
                                         {"effects --set bass", "like bass=6"},
                                         {"effects --render a.wav", "FILE"},
@@ -83,6 +101,8 @@ TEST_F(CommandLine, SeekPrintsWhereEachPositionLandsAndFailsOutsideTheFileInThat
          "     0       0  yes\n"
          "  4200    4000  yes\n"
          " 59999   58000  yes\n");
+  Expect("$Z seek a.mp4 4200ms 4.2s 0:04.2 4s 0:00:59 | cut -c-6", 0,
+         " asked\n  4200\n  4200\n  4200\n  4000\n 59000\n");
   Expect("$Z seek a.mp4 -1 12345678 2000", 1,
          "   asked    landed  key frame\n"
          "      -1         -  E_INVALID_ARG\n"
@@ -91,7 +111,12 @@ TEST_F(CommandLine, SeekPrintsWhereEachPositionLandsAndFailsOutsideTheFileInThat
          AllOf(StartsWith("zelkora: cannot move to -1 ms: position -1 ms is outside"),
                HasSubstr("\nzelkora: cannot move to 12345678 ms: ")));
   Expect("$Z --verbose seek a.mp4 -1", 1, HasSubstr("E_INVALID_ARG"),
-         HasSubstr("error module=60 result=E_INVALID_ARG"));
+         HasSubstr("debug module=60 result=E_INVALID_ARG"));
+}
+
+TEST_F(CommandLine, SeekListsAllKeyFrames) {
+  Expect("$Z seek a.mp4 --keys", 0, AllOf(StartsWith("0\n2000\n4000\n"), EndsWith("\n60000\n")));
+  Expect("$Z seek a.mp4 --keys 4200", 2, "", HasSubstr("--keys"));
 }
 
 TEST_F(CommandLine, SeekWithoutAReaderFailsQuietlyAndOnAFullDiskInWords) {
@@ -102,7 +127,7 @@ TEST_F(CommandLine, SeekWithoutAReaderFailsQuietlyAndOnAFullDiskInWords) {
 
 TEST_F(CommandLine, SeekInAFileThatCannotBeOpenedTellsWhyOnce) {
 #ifdef WITH_DESKTOP
-  Expect(PROGRAM " --device desktop seek missing.mp4 0", 1, "",
+  Expect("$D seek missing.mp4 0", 1, "",
          testing::MatchesRegex("zelkora: cannot open missing.mp4: .* \\(E_OBJ_NOT_FOUND\\)\n"));
 #else
   Expect("$Z seek '' 0", 1, "", testing::MatchesRegex("zelkora: .* \\(E_INVALID_ARG\\)\n"));
@@ -122,20 +147,54 @@ TEST_F(CommandLine, FilmstripHasEachKeyFrameOnce) {
 }
 
 TEST_F(CommandLine, FilmstripThatCannotBeWrittenLeavesNothing) {
-  for (const std::string output : {"missing/strip.png", ".", "/dev/null"}) {
+  Expect("mkdir folder.png; ln -s /dev/null null.png", 0, "");
+  for (const std::string output : {"missing/strip.png", "folder.png", "null.png"}) {
     Expect("$Z filmstrip a.mp4 -o " + output, 1, "",
            AllOf(StartsWith("zelkora: "), HasSubstr(output)));
   }
+  Expect("$Z filmstrip a.mp4 -o - | head -c 4", 0, "\x89PNG");
   Expect("(ulimit -f 0; trap '' XFSZ; $Z filmstrip a.mp4 2>&1) | cat", 0,
          "zelkora: cannot write strip.png: File too large\n");
-  EXPECT_TRUE(fs::is_empty(folder_));
+  Expect("ls -A", 0, "folder.png\nnull.png\n");
 }
+
+TEST_F(CommandLine, WhatIsReadIsNeverWrittenOver) {
+  Expect("echo mine >a.png; ln a.png hard.png; ln -s a.png soft.png; ln a.png a.wav", 0, "");
+  for (const std::string command :
+       {"filmstrip a.png -o a.png", "filmstrip a.png -o soft.png", "filmstrip soft.png -o hard.png",
+        "effects a.wav --render a.wav", "effects a.wav --plot hard.png"}) {
+    Expect("$Z " + command, 2, "", HasSubstr(" would be written over "));
+    EXPECT_EQ(Read(folder_ / "a.png"), "mine\n");
+  }
+  Expect("$Z filmstrip b.mp4 -n 1 -o soft.png", 0, HasSubstr("1 frame"));
+  EXPECT_TRUE(fs::is_symlink(folder_ / "soft.png"));
+  EXPECT_THAT(Read(folder_ / "a.png"), StartsWith("\x89PNG\r\n"));  // an older one is replaced
+  EXPECT_EQ(Read(folder_ / "hard.png"), "mine\n");
+}
+
+#ifdef WITH_DESKTOP
+TEST_F(CommandLine, RenderingThatIsInterruptedLeavesNothingAndOnAPipeIsWhole) {
+  Expect("head -c 100000000 /dev/zero | sox -t raw -r 48000 -e signed -b 16 -c 2 - a.wav", 0, "");
+  for (const auto& [signal, code] : {std::pair{"INT", 130}, {"TERM", 143}}) {
+    Expect(
+        "$D effects a.wav --render b.wav >/dev/null & until ls .zelkora-*/*.part; do "
+        "kill -0 $! || exit; done >/dev/null 2>&1; kill -" +
+            std::string(signal) + " $!; wait $!",
+        code, "", testing::_);
+    Expect("ls -A", 0, "a.wav\n");
+  }
+  Expect("$D effects a.wav --render - | sox -t wav - -t raw - | wc -c", 0, "100000000\n");
+}
+#endif
 
 TEST_F(CommandLine, ManagersAreShownAndSetAndRefusalsExplained) {
   Expect("$Z volume media", 0, "media             7       15  #########...........\n");
   Expect("$Z volume media 15", 0, "");
   Expect("$Z volume media 16", 1, "",
-         "zelkora: cannot set the media volume to 16: an argument is rejected (E_INVALID_ARG)\n");
+         "zelkora: cannot set the media volume to 16: the levels are 0 to 15 (E_INVALID_ARG)\n");
+  Expect("$Z volume media +1", 0, "media             8       15  ##########..........\n");
+  Expect("$Z volume media -9", 0, HasSubstr(" 0 "));
+  Expect("$Z volume media 60%", 0, HasSubstr(" 9 "));
   Expect("$Z mute", 0, "off\n");
   Expect("$Z mute on", 0, "");
   Expect("$Z session", 0, "media\n");
@@ -163,10 +222,24 @@ TEST_F(CommandLine, ShellPlaysEachScenarioAsExpected) {
   for (fs::path file : fs::directory_iterator(SCENARIOS)) {
     if (file.extension() != ".txt") continue;
     ++count;
-    const std::string command = "$Z shell " + file.string() + " 2>&1";
+    const std::string command = "$Z shell --no-wait " + file.string() + " 2>&1";
     Expect(command, 0, Read(file.replace_extension(".expected")));
   }
   EXPECT_GE(count, 3);
+}
+
+TEST_F(CommandLine, WhatIsRecordedPlaysBackAsItWasHeard) {
+  const std::string heard =
+      "disruption\ninterruption started\ninterruption finished\ninterruption started\n"
+      "volume call 10\nmute on\nmute off\ninterruption finished\n";
+  ::CommandLine::Recording recording(folder_ / "a.txt", "alarm");
+  std::istringstream lines(heard);
+  for (std::string line; std::getline(lines, line);) recording.Add(line);
+  usleep(20000);
+  recording.Add("volume media 9");
+  recording.Complete();
+  EXPECT_THAT(Read(folder_ / "a.txt"), AllOf(HasSubstr("session alarm\n"), HasSubstr("\nwait 2")));
+  Expect("$Z shell a.txt | sed -n 's/^< //p'", 0, heard + "volume media 9\n");
 }
 
 TEST_F(CommandLine, ShellEndsAtALineThatIsNotUnderstoodButInATerminalPromptsAndGoesOn) {
@@ -174,7 +247,7 @@ TEST_F(CommandLine, ShellEndsAtALineThatIsNotUnderstoodButInATerminalPromptsAndG
          StartsWith("zelkora: standard input:2: "));
   Expect("printf 'frob\\nsession alarm\\nsession\\nexit\\n' | script -qec \"$Z shell\" /dev/null",
          0,
-         AllOf(HasSubstr("zelkora> "), HasSubstr("not expected: frob"), HasSubstr("\nalarm\r\n")));
+         AllOf(HasSubstr("zelkora> "), HasSubstr("no command 'frob'"), HasSubstr("\nalarm\r\n")));
 }
 
 TEST_F(CommandLine, EffectsAreChangedInTheOrderGivenAndRefusedOutsideTheirRange) {
@@ -184,10 +257,18 @@ TEST_F(CommandLine, EffectsAreChangedInTheOrderGivenAndRefusedOutsideTheirRange)
          "treble          -12"},
         {"--set bass=6 --reset --set treble=3", "bass              0", "treble            3"},
         {"--set bass=6 --set bass=-1 a.ogg", "bass             -1", "treble            0"}}) {
-    Expect("$Z effects " + std::string(options), 0, AllOf(HasSubstr(bass), HasSubstr(treble)));
+    Expect("$Z effects " + std::string(options), 0, AllOf(HasSubstr(bass), HasSubstr(treble)),
+           *options == '\0' ? Text("") : HasSubstr("note: the changes are gone"));
   }
   Expect("$Z effects --set bass=13", 1, "",
          StartsWith("zelkora: cannot set bass 13: level 13 is outside"));
+}
+
+TEST_F(CommandLine, EverythingThatTheDeviceHasIsCalledByItsName) {
+  std::size_t types = 0;
+  for (int highest; sound_manager_get_max_volume(static_cast<int>(types), &highest) == 0;) ++types;
+  EXPECT_EQ(std::size(::CommandLine::kCategories), types);
+  Expect("$Z effects", 0, Not(ContainsRegex("(\n|presets:.* )[0-9]")));
 }
 
 TEST_F(CommandLine, EffectsArePlottedAndLeaveNoFileWhereTheyCannotBeHeard) {
@@ -195,31 +276,48 @@ TEST_F(CommandLine, EffectsArePlottedAndLeaveNoFileWhereTheyCannotBeHeard) {
   Expect("$Z effects --plot b.svg", 1, StartsWith("effect"), StartsWith("zelkora: "));
   EXPECT_TRUE(fs::is_empty(folder_));
 #ifdef WITH_DESKTOP
-  Expect(PROGRAM " effects --set bass=6 --plot a.png", 0, HasSubstr("a.png: bass 6"));
-  Expect(PROGRAM " effects --preset rock --plot b.svg", 0, HasSubstr("b.svg: preset rock"));
+  Expect("$D effects --set bass=6 --plot a.png", 0, HasSubstr("a.png: bass 6"));
+  Expect("$D effects --preset rock --plot b.svg", 0, HasSubstr("b.svg: preset rock"));
   EXPECT_THAT(Read(folder_ / "a.png"), StartsWith("\x89PNG\r\n"));
   EXPECT_THAT(Read(folder_ / "b.svg"), HasSubstr("</svg>"));
 #endif
 }
 
-TEST_F(CommandLine, DevicesMarksTheOneInUse) {
-  Expect("$Z devices", 0, HasSubstr("* simulated"));
+TEST_F(CommandLine, WordsAreCompletedFromTheCommandsAndValuesThatThereAre) {
+  for (const auto& [words, completed] : {std::pair{"vol", "volume\n"},
+                                         {"effects --preset r", "rhythm-and-blues\nrock\n"},
+                                         {"effects --set s", "stereo-width=\n"},
+                                         {"--device sim", "simulated\n"},
+                                         {"call --for 1 --mode v", "voice\n"},
+                                         {"filmstrip ''", "FILE\n"},
+                                         {"mute on ''", ""}}) {
+    Expect(PROGRAM " --complete " + std::string(words), 0, completed);
+  }
+}
+
+TEST_F(CommandLine, DoctorTellsWhatIsMissingAndWhatMendsIt) {
+  Expect("$Z doctor", 0, "device: simulated\nnothing is missing\n");
 #ifdef WITH_DESKTOP
-  Expect(PROGRAM " devices", 0, HasSubstr("* desktop"));
-  Expect(PROGRAM " devices --device desktop", 0, HasSubstr("* desktop"));
+  Expect("PULSE_SERVER=unix:none $D doctor", 1,
+         AllOf(HasSubstr("ok       video: H.264\n"),
+               HasSubstr("missing  sound server\n         mend it: pulseaudio --start\n")));
 #endif
 }
 
-TEST_F(CommandLine, DeviceScriptRunsAProgramOnTheDeviceAndRefusesOneThatIsNotThere) {
+TEST_F(CommandLine, ProgramRunsOnTheDeviceThatIsNamedUnlessThatIsNotThere) {
   for (const std::string build : {"", "ZELKORA_BUILD=" BUILD_FOLDER " "}) {
     Expect(build + DEVICE_SCRIPT " simulated " PROGRAM " devices", 0,
            HasSubstr("* simulated  " BUILD_FOLDER));
   }
+#ifdef WITH_DESKTOP
+  Expect(PROGRAM " devices", 0, HasSubstr("* desktop"));
+  Expect(PROGRAM " devices --device desktop", 0, HasSubstr("* desktop"));
+#endif
   Expect(DEVICE_SCRIPT " simulated " PROGRAM " frob", 2, "", HasSubstr("frob"));
   fs::create_directories(folder_ / "build/lib/zelkora-media");
   for (const auto& [command, code, reason] :
        {std::tuple{DEVICE_SCRIPT " nix echo run", 2, "there is no device 'nix'"},
-        {"ZELKORA_BUILD=build " DEVICE_SCRIPT " desktop echo run", 1, "'desktop' is not built"},
+        {"ZELKORA_BUILD=build " DEVICE_SCRIPT " desktop echo run", 1, "no devices are built"},
         {"ZELKORA_BUILD=nowhere " DEVICE_SCRIPT " desktop echo run", 1, "no devices are built"},
         {DEVICE_SCRIPT " simulated", 2, "Usage"}}) {
     Expect(command, code, "", HasSubstr(reason));

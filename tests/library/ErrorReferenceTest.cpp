@@ -1,0 +1,305 @@
+// Provokes every row of docs/errors.md, each in a process of its own.
+
+#include "support/Allocations.h"
+#include "support/Operations.h"
+#include "support/OwnProcess.h"
+
+#include <Tizen/Media/PlayerImpl.h>
+
+#include <fstream>
+#include <regex>
+#include <set>
+
+namespace Zelkora::Media {
+namespace {
+
+/// A row of the page, or a case of it: one class, one operation, one code.
+struct Row {
+  std::vector<std::string> classes, operations;
+  std::string cause, returned, last;
+  Lines log;
+
+  std::string className = "", operation = "";
+  int code = -38;
+  result converted = E_INVALID_OPERATION;
+};
+
+/// The page's rows, and the results of the device's numbers.
+struct Page {
+  std::vector<Row> rows;
+  std::map<int, result> soundManagerNumbers, playerNumbers;
+};
+
+std::string Read(const std::string& path) {
+  std::ifstream file(ZELKORA_SOURCE_DIR "/" + path);
+  return {std::istreambuf_iterator<char>(file), {}};
+}
+
+/// \return what \p pattern's first group matches in \p text, each time
+Lines FindAll(const std::string& text, const std::string& pattern) {
+  const std::regex regex(pattern);
+  Lines found;
+  for (std::sregex_iterator i(text.begin(), text.end(), regex), end; i != end; ++i) {
+    found.push_back((*i)[1]);
+  }
+  return found;
+}
+
+Lines Quoted(const std::string& text) { return FindAll(text, "`([^`]*)`"); }
+
+/// \return the name in a cell, or its plain text
+std::string Entry(const std::string& cell) {
+  const Lines quoted = Quoted(cell);
+  return quoted.empty() ? cell : quoted.front();
+}
+
+result FromName(const std::string& name) {
+  for (const result r : {E_INVALID_ARG, E_INVALID_OPERATION, E_INVALID_STATE, E_OUT_OF_MEMORY}) {
+    if (name == GetErrorMessage(r)) return r;
+  }
+  return E_SYSTEM;
+}
+
+Page ReadPage() {
+  Page page;
+  Lines classes;
+  std::map<int, result>* numbers = nullptr;
+  std::istringstream lines(Read("docs/errors.md"));
+  for (std::string line; std::getline(lines, line);) {
+    if (line.rfind("## ", 0) == 0) classes = Quoted(line);
+    if (line.rfind("| Sound manager's", 0) == 0) numbers = &page.soundManagerNumbers;
+    if (line.rfind("| Player's", 0) == 0) numbers = &page.playerNumbers;
+    const Lines cells = FindAll(line + " ", "\\| (.*?) (?=\\| )");
+    if (cells.size() == 2 && line.find('`') != line.npos) {
+      (*numbers)[std::stoi(cells[0].substr(cells[0].rfind('-')))] = FromName(Entry(cells[1]));
+    } else if (cells.size() == 3 && line.rfind("| `", 0) == 0) {
+      page.rows.push_back({Quoted(cells[0]), {""}, cells[1], "", "as it was", Quoted(cells[2])});
+    } else if (cells.size() == 5 && line.rfind("| `", 0) == 0) {
+      page.rows.push_back({classes, Quoted(cells[0]), cells[1], Entry(cells[2]), Entry(cells[3]),
+                           Quoted(cells[4])});
+    }
+  }
+  return page;
+}
+
+std::optional<FailingAllocation> failing;
+
+void SetFeatures(result answer) {
+  for (const auto feature : Host::kFeatures) Host::SetFeature(feature, answer);
+}
+
+void Interrupt(int code) { Simulated::Interrupt(code), Host::WaitUntilDelivered(); }
+void Change(int type) { Simulated::ReportVolume(type, 3), Host::WaitUntilDelivered(); }
+Answer Perform(const Row& row) { return kOperations.at(row.className + "::" + row.operation)(); }
+void OpenFile() { player->OpenFile("movie"); }
+
+/// The privilege that each class needs; the others are there.
+const std::map<std::string, const char*> kPrivileges = {
+    {Facts<Session>::kName, Facts<Session>::kPrivilege},
+    {Facts<Call>::kName, Facts<Call>::kPrivilege},
+    {Facts<Volume>::kName, Facts<Volume>::kPrivilege},
+};
+
+/// How each cause comes about, but for functions that merely refuse.
+const std::map<std::string, std::function<void(const Row&)>> kCauses = {
+    {"the privilege is missing",
+     [](auto& row) { Host::SetPrivilege(kPrivileges.at(row.className), E_SYSTEM); }},
+    {"the device lacks the feature", [](auto&) { SetFeatures(Host::kFeatureAbsent); }},
+    {"the platform doesn't know the feature", [](auto&) { SetFeatures(E_OBJ_NOT_FOUND); }},
+    {"the feature can't be looked up", [](auto&) { SetFeatures(kForeign); }},
+    {"no memory for the manager", [](auto&) { failing.emplace(0); }},
+    {"no memory for the implementation",
+     [](const Row& row) { failing.emplace(row.operation == "GetInstance" ? 1 : 0); }},
+    {"no memory for the event", [](auto&) { failing.emplace(2); }},
+    {"no memory for the list", [](auto&) { failing.emplace(0); }},
+    {"the creation failed at an earlier call",
+     [](const Row& row) {
+       failing.emplace(0);
+       Perform(row);
+       failing.reset();
+     }},
+    {"a session is open already", [](auto&) { instance<Call>->EnterCallSession(); }},
+    {"no session is open", [](auto&) {}},
+    {"the device succeeds and gives no session",
+     [](auto&) { Simulated::SetCallSessionFault(Simulated::CallSessionFault::kNoSession); }},
+    {"the mode is 5",
+     [](auto& row) { MakeReady(row.operation), callMode = VoipAudioSessionMode(5); }},
+    {"the level is out of range", [](auto&) { level = -1; }},
+    {"the listener is added already", Perform},
+    {"the listener isn't added", [](auto&) {}},
+    {"the player was never constructed", [](auto&) { player.emplace(); }},
+    {"the player has no native handle",
+     [](auto&) {
+       auto& handle = Tizen::Media::_PlayerImpl::GetInstance(&*player)->__hPlayer;
+       player_destroy(std::exchange(handle, nullptr));
+     }},
+    {"the player supports no effect and no preset",
+     [](auto&) {
+       Simulated::SetEffects({{}, {}, {}, 0});
+     }},
+    {"it has succeeded before", Perform},
+    {"`Construct` hasn't succeeded", [](auto&) { effector.emplace(), seeker.emplace(); }},
+    {"the player reports an unknown effect, which is left out",
+     [](auto&) {
+       Simulated::SetEffects({{2, 6}, {}, {}, 0});
+     }},
+    {"the player reports an unknown preset, which is left out",
+     [](auto&) {
+       Simulated::SetEffects({{}, {20, 2}, {}, 0});
+     }},
+    {"the effect is 6", [](auto&) { effect = AudioEffectType(6); }},
+    {"the preset is 20", [](auto&) { preset = AudioEffectPreset(20); }},
+    {"no file is open", [](auto&) {}},
+    {"the position is outside the film", [](auto&) { OpenFile(), position = -1; }},
+    {"the file has no video",
+     [](auto&) {
+       Simulated::SetMedia({60000, 2000, {}, false}), OpenFile();
+     }},
+    {"an interruption of code 0 to 6; the listener hears of it", [](auto&) { Interrupt(5); }},
+    {"an interruption of another code", [](auto&) { Interrupt(7); }},
+    {"an interruption without user data",
+     [](auto&) { Simulated::ReportWithoutUserData(true), Interrupt(5); }},
+    {"an interruption without memory for its event",
+     [](auto&) { failing.emplace(0), Interrupt(5); }},
+    {"an interruption that begins, and `_Event::FireAsync` refuses", [](auto&) { Interrupt(5); }},
+    {"a disruption, and `_Event::FireAsync` refuses", [](auto&) { Interrupt(1); }},
+    {"a session is open at exit, and `sound_manager_call_session_destroy` refuses",
+     [](auto&) { instance<Call>->EnterCallSession(); }},
+    {"a change of an unknown sound type", [](auto&) { Change(6); }},
+    {"a change without user data",
+     [](auto&) { Simulated::ReportWithoutUserData(true), Change(4); }},
+    {"a change without memory for its event", [](auto&) { failing.emplace(0), Change(4); }},
+    {"a mute without user data",
+     [](auto&) {
+       Simulated::ReportWithoutUserData(true), Simulated::ReportMuteAll(true);
+       Host::WaitUntilDelivered();
+     }},
+    {"a change, and `_Event::FireAsync` refuses", [](auto&) { Change(4); }},
+};
+
+std::string Replace(std::string text, const std::string& from, const std::string& to) {
+  const std::size_t at = text.find(from);
+  return at == text.npos ? text : text.replace(at, from.size(), to);
+}
+
+class ErrorReference : public LibraryTest {
+ protected:
+  void Arrange(const Row& row) {
+    if (row.cause.find("` refuses") != row.cause.npos) {
+      const std::string function = FindAll(row.cause, "`([^`]*)` refuses").front();
+      if (row.operation != "GetInstance" && row.operation != "Construct") MakeReady(row.operation);
+      if (row.operation == "SetAudioSessionEventListener") Perform(row);
+      Host::FailCall(function.c_str(), row.code);
+    }
+    Forget();
+    if (kCauses.count(row.cause) != 0) kCauses.at(row.cause)(row);
+  }
+
+  /// Provokes a row, and compares all that it says.
+  void Provoke(const Row& row) {
+    static std::function<void()> compare;
+    std::string answer;
+    compare = [&, this] { Compare(row, answer); };
+    if (row.cause.find("at exit") != row.cause.npos) {  // what comes first is run last there
+      std::atexit([] { compare(), std::_Exit(HasFailure()); });
+    }
+    Prepare(row.operation);
+    Arrange(row);
+    if (row.cause.find("at exit") != row.cause.npos) std::exit(0);
+    if (!row.operation.empty()) {
+      log.Take();
+      log.operation = row.operation;
+      SetLastResult(kUntouched);
+      answer = Perform(row).Text();
+    }
+    compare();
+  }
+
+  void Compare(const Row& row, const std::string& answer) {
+    const auto meant = [&](const std::string& cell) -> std::string {
+      if (cell == "as it was") return GetErrorMessage(kUntouched);
+      return cell.find("code") == cell.npos ? cell : GetErrorMessage(row.converted);
+    };
+    EXPECT_EQ(answer, meant(row.returned));
+    EXPECT_EQ(GetErrorMessage(GetLastResult()),
+              meant(row.last == "same" ? row.returned : row.last));
+    failing.reset();
+    Lines expected;
+    char hex[16];
+    std::snprintf(hex, sizeof hex, "0x%x", unsigned(row.code));
+    for (const std::string& line : row.log) {
+      const std::string named =
+          Replace(Replace(line, "RESULT", GetErrorMessage(row.converted)), "\\t", "\t");
+      expected.push_back(Replace(Replace(named, "0xCODE", hex), "CODE", std::to_string(row.code)));
+    }
+    EXPECT_EQ(log.Take(), expected);
+  }
+};
+
+/// \return the cases of a row: each class, operation and code of it
+std::vector<Row> Cases(const Page& page, const Row& row) {
+  std::vector<Row> cases;
+  for (const std::string& className : row.classes) {
+    std::map<int, result> codes = {{-38, E_INVALID_OPERATION}};
+    const std::string answers = row.returned + row.last;
+    if (row.cause.find("FireAsync") != row.cause.npos ||
+        answers.find("the platform's code") != answers.npos) {
+      codes = {{int(kForeign), kForeign}};
+    }
+    if (answers.find("the converted code") != answers.npos) {
+      codes = className == "AudioEffector" ? page.playerNumbers : page.soundManagerNumbers;
+    }
+    for (const std::string& pattern : row.operations) {
+      for (const SoundCategory& category : kSoundCategories) {
+        for (const auto& [code, converted] : codes) {
+          Row one = row;
+          one.className = className;
+          one.operation = Replace(pattern, "*", category.name);
+          one.code = code;
+          one.converted = converted;
+          cases.push_back(one);
+        }
+        if (pattern.find('*') == pattern.npos) break;
+      }
+    }
+  }
+  return cases;
+}
+
+TEST_F(ErrorReference, SaysOfEachRowWhatTheLibraryDoes) {
+  const Page page = ReadPage();
+  std::string untrue;
+  int cases = 0;
+  for (const Row& row : page.rows) {
+    for (const Row& one : Cases(page, row)) {
+      ++cases;
+      const std::string name = one.className + "::" + one.operation + ": " + row.cause + "\n";
+      if (StatusOfOwnProcess([&] { Provoke(one); }) != 0) untrue += name;
+    }
+  }
+  EXPECT_EQ(untrue, "");
+  EXPECT_GT(cases, 200);
+}
+
+TEST_F(ErrorReference, HasARowForEachOperationOfTheHeaders) {
+  std::set<std::string> described, declared;
+  const Page page = ReadPage();
+  for (const Row& row : page.rows) {
+    for (const Row& one : Cases(page, row)) described.insert(one.className + "::" + one.operation);
+  }
+  for (const char* name : {"AudioEffector", "AudioSessionManager", "VoipAudioSessionManager",
+                           "AudioVolumeManager", "VideoKeyFrameSeeker"}) {
+    std::string header = Read(std::string("inc/Zelkora/Media/") + name + ".h");
+    header = header.substr(header.find("\nclass ZELKORA_MEDIA_API"));
+    header.resize(header.find("private:"));
+    for (const std::string& operation : FindAll(header, "\n  [\\w:<>* ]* \\*?(\\w+)\\(")) {
+      declared.insert(std::string(name) + "::" + operation);
+    }
+  }
+  EXPECT_GT(declared.size(), 40u);
+  for (const std::string& operation : declared)
+    EXPECT_EQ(described.count(operation), 1u) << operation;
+}
+
+}  // namespace
+}  // namespace Zelkora::Media

@@ -1,7 +1,7 @@
 // What the desktop player's effects cost: the processor time of a whole film's decoding, as fast as
 // it goes, without their chain, with it at rest and with all of it at work. Fails above the limits.
 
-#include "../platform/desktop/effects/Chain.h"
+#include "desktop/player/effects/Chain.h"
 
 #include <sys/resource.h>
 

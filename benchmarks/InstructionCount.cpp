@@ -2,13 +2,15 @@
 // simulated device.
 //   instruction-count OPERATION TIMES
 
-#include <Host/Log.h>
+#include <Host/Events.h>
 #include <Tizen/Media/Player.h>
 #include <Zelkora/Media/AudioEffector.h>
 #include <Zelkora/Media/AudioSessionManager.h>
 #include <Zelkora/Media/AudioVolumeManager.h>
+#include <Zelkora/Media/IAudioVolumeEventListener.h>
 #include <Zelkora/Media/VideoKeyFrameSeeker.h>
 #include <Zelkora/Media/VoipAudioSessionManager.h>
+#include <sound_manager.h>
 
 #include <cstdio>
 #include <cstdlib>
@@ -74,13 +76,35 @@ Operation SettingAnEffect() {
   return [] { Demand(effector.SetEffectLevel(AUDIO_EFFECT_BASS, 6) == E_SUCCESS, "an effect"); };
 }
 
+sound_manager_volume_changed_cb volumeChanged = nullptr;
+void* volumeChangedData = nullptr;
+
+Operation Firing() {
+  static struct : IAudioVolumeEventListener {
+  } listener;
+  TheManager<AudioVolumeManager>().AddAudioVolumeEventListener(listener);
+  std::atexit(Host::WaitUntilDelivered);  // before the manager goes
+  return [] { volumeChanged(4, 7, volumeChangedData); };
+}
+
 }  // namespace
 
+// In place of the device's: so the callback is called as a device would, without a device between.
+extern "C" int sound_manager_set_volume_changed_cb(sound_manager_volume_changed_cb callback,
+                                                   void* user_data) {
+  volumeChanged = callback;
+  volumeChangedData = user_data;
+  return 0;
+}
+
 int main(int argc, char** argv) {
-  const std::map<std::string, Operation (*)()> operations = {
-      {"set-volume", SettingALevel}, {"get-volume", ReadingALevel},
-      {"set-mode", SettingAMode},    {"set-call-mode", SettingACallMode},
-      {"construct", Constructing},   {"effect", SettingAnEffect}};
+  const std::map<std::string, Operation (*)()> operations = {{"set-volume", SettingALevel},
+                                                             {"get-volume", ReadingALevel},
+                                                             {"set-mode", SettingAMode},
+                                                             {"set-call-mode", SettingACallMode},
+                                                             {"construct", Constructing},
+                                                             {"effect", SettingAnEffect},
+                                                             {"event", Firing}};
   const auto found = operations.find(argc == 3 ? argv[1] : "");
   if (found == operations.end()) {
     std::fprintf(stderr, "usage: instruction-count OPERATION TIMES\n");

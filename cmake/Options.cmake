@@ -11,13 +11,14 @@ else()
   set(ZELKORA_HOST_PLATFORM ON)
 endif()
 
+# A project that adds this one as a folder gets the library and the simulated device.
 include(CMakeDependentOption)
-cmake_dependent_option(ZELKORA_DESKTOP "Build the desktop device (GStreamer, PulseAudio)" ON
+cmake_dependent_option(ZELKORA_DESKTOP "Build the desktop device (GStreamer, PulseAudio)" ${PROJECT_IS_TOP_LEVEL}
   "ZELKORA_HOST_PLATFORM" OFF)
-cmake_dependent_option(ZELKORA_TOOLS "Build the command-line program" ON
+cmake_dependent_option(ZELKORA_TOOLS "Build the command-line program" ${PROJECT_IS_TOP_LEVEL}
   "ZELKORA_HOST_PLATFORM" OFF)
-cmake_dependent_option(ZELKORA_TESTS "Build the tests" ON "ZELKORA_HOST_PLATFORM" OFF)
-cmake_dependent_option(ZELKORA_BENCHMARKS "Build the benchmarks" ON "ZELKORA_DESKTOP" OFF)
+cmake_dependent_option(ZELKORA_TESTS "Build the tests" ${PROJECT_IS_TOP_LEVEL} "ZELKORA_HOST_PLATFORM" OFF)
+cmake_dependent_option(ZELKORA_BENCHMARKS "Build the benchmarks" ON "ZELKORA_DESKTOP;ZELKORA_TESTS" OFF)
 option(ZELKORA_WERROR "Treat warnings as errors" OFF)
 
 if(ZELKORA_DESKTOP)

@@ -1,0 +1,38 @@
+# What is used besides the standard library and POSIX, each found once.
+
+if(ZELKORA_HOST_PLATFORM)
+  find_package(Threads REQUIRED)
+endif()
+
+if(ZELKORA_DESKTOP OR ZELKORA_TOOLS)
+  find_package(PkgConfig REQUIRED)
+endif()
+if(ZELKORA_DESKTOP)
+  pkg_check_modules(GSTREAMER REQUIRED IMPORTED_TARGET
+    gstreamer-1.0>=1.20 gstreamer-audio-1.0 gstreamer-base-1.0 gstreamer-pbutils-1.0 gstreamer-video-1.0)
+  pkg_check_modules(PULSE REQUIRED IMPORTED_TARGET libpulse)
+endif()
+if(ZELKORA_TOOLS)
+  find_package(CLI11 REQUIRED)
+  find_package(fmt REQUIRED)
+  foreach(package cairo libedit fftw3 sndfile)
+    string(TOUPPER ${package} name)
+    pkg_check_modules(${name} REQUIRED IMPORTED_TARGET ${package})
+  endforeach()
+endif()
+
+if(ZELKORA_TESTS)
+  if(CMAKE_CROSSCOMPILING)
+    # No foreign architecture's packages are needed: the sources come with Debian's googletest.
+    set(INSTALL_GTEST OFF)
+    add_subdirectory(/usr/src/googletest ${PROJECT_BINARY_DIR}/googletest EXCLUDE_FROM_ALL)
+    foreach(target gtest gtest_main gmock gmock_main)
+      target_compile_options(${target} PRIVATE -w)
+    endforeach()
+  else()
+    find_package(GTest REQUIRED)
+  endif()
+  if(ZELKORA_DESKTOP)
+    pkg_check_modules(GSTREAMER_CHECK REQUIRED IMPORTED_TARGET gstreamer-check-1.0)
+  endif()
+endif()

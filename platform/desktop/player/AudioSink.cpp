@@ -8,7 +8,9 @@
 #include <algorithm>
 #include <atomic>
 #include <chrono>
+#include <cstdint>
 #include <cstring>
+#include <optional>
 #include <string>
 #include <thread>
 
@@ -23,8 +25,8 @@ constexpr std::chrono::milliseconds kServerLimit{300};
 /// As far as a sink writes ahead of what is heard, and so the longest wait for it.
 constexpr std::chrono::milliseconds kWrittenAhead{200};
 
-using MainLoopPtr = std::unique_ptr<pa_mainloop, FreeWith<pa_mainloop_free>>;
-using ContextPtr = std::unique_ptr<pa_context, FreeWith<pa_context_unref>>;
+/// By then a new stream is played.
+constexpr GstClockTime kSilenceAfter = 100 * GST_MSECOND;
 
 /// Runs one turn of the loop, at most until \p end. \return whether there may be another
 bool RunUntil(pa_mainloop* loop, Clock::time_point end) {
@@ -34,22 +36,57 @@ bool RunUntil(pa_mainloop* loop, Clock::time_point end) {
          pa_mainloop_poll(loop) >= 0 && pa_mainloop_dispatch(loop) >= 0;
 }
 
-/// Asked before the sink is made, because a sink without a server fails loudly, and late.
-bool IsSoundServerThere() {
-  const MainLoopPtr loop(pa_mainloop_new());
-  if (loop == nullptr) return false;
-  const ContextPtr context(pa_context_new(pa_mainloop_get_api(loop.get()), "zelkora"));
-  if (context == nullptr) return false;
-  if (pa_context_connect(context.get(), nullptr, PA_CONTEXT_NOAUTOSPAWN, nullptr) < 0) return false;
-
-  const auto end = Clock::now() + kServerLimit;
-  while (PA_CONTEXT_IS_GOOD(pa_context_get_state(context.get())) &&
-         pa_context_get_state(context.get()) != PA_CONTEXT_READY && RunUntil(loop.get(), end)) {
+/// A connection to the sound server that works only while it is waited for.
+class ServerVisit {
+ public:
+  ServerVisit() = default;
+  ~ServerVisit() {
+    if (context_ != nullptr) pa_context_disconnect(context_.get());
   }
-  const bool isThere = pa_context_get_state(context.get()) == PA_CONTEXT_READY;
-  pa_context_disconnect(context.get());
-  return isThere;
-}
+
+  ServerVisit(const ServerVisit&) = delete;
+  ServerVisit& operator=(const ServerVisit&) = delete;
+
+  /// \return whether the server has answered in time; to be called once, and first
+  bool Connect() {
+    if (loop_ == nullptr) return false;
+    context_.reset(pa_context_new(pa_mainloop_get_api(loop_.get()), "zelkora"));
+    return context_ != nullptr &&
+           pa_context_connect(context_.get(), nullptr, PA_CONTEXT_NOAUTOSPAWN, nullptr) >= 0 &&
+           WaitUntil([this] { return pa_context_get_state(context_.get()) == PA_CONTEXT_READY; });
+  }
+
+  /// Begins to play silence, which goes on as long as this lives: a server plays it for a stream that
+  /// isn't fed. \return whether the server plays it
+  bool PlaySilence() {
+    constexpr pa_sample_spec kFormat = {PA_SAMPLE_S16NE, 8000, 1};
+    constexpr auto kAsItLikes = static_cast<std::uint32_t>(-1);
+    constexpr std::uint32_t kAhead = 8000 * 2 / 20;  // bytes for a twentieth of a second
+    constexpr pa_buffer_attr kBuffer = {kAsItLikes, kAhead, 0, kAhead / 4, kAsItLikes};
+    stream_.reset(pa_stream_new(context_.get(), "silence", &kFormat, nullptr));
+    return stream_ != nullptr &&
+           pa_stream_connect_playback(stream_.get(), nullptr, &kBuffer, PA_STREAM_ADJUST_LATENCY,
+                                      nullptr, nullptr) >= 0 &&
+           WaitUntil([this] { return pa_stream_get_state(stream_.get()) == PA_STREAM_READY; });
+  }
+
+ private:
+  template <typename Condition>
+  bool WaitUntil(Condition condition) {
+    const auto end = Clock::now() + kServerLimit;
+    while (PA_CONTEXT_IS_GOOD(pa_context_get_state(context_.get())) && !condition() &&
+           RunUntil(loop_.get(), end)) {
+    }
+    return condition();
+  }
+
+  const std::unique_ptr<pa_mainloop, FreeWith<pa_mainloop_free>> loop_{pa_mainloop_new()};
+  std::unique_ptr<pa_context, FreeWith<pa_context_unref>> context_;
+  std::unique_ptr<pa_stream, FreeWith<pa_stream_unref>> stream_;
+};
+
+/// Asked before the sink is made, because a sink without a server fails loudly, and late.
+bool IsSoundServerThere() { return ServerVisit().Connect(); }
 
 constexpr char kRoleProperty[] = "media.role";
 
@@ -92,25 +129,44 @@ bool ReplaceStream(GstPad* pad, const char* role) {
   return gst_pad_send_event(pad, gst_event_new_caps(marked.get()));
 }
 
-/// Has the stream follow the session's role. On the streaming thread, which alone uses the sink's
+/// Has a sink's stream follow the session's role. On the streaming thread, which alone uses the sink's
 /// properties by then.
-GstPadProbeReturn OnSound(GstPad* pad, GstPadProbeInfo* info, gpointer data) {
-  GstElement* sink = GST_ELEMENT(data);
-  const char* role = GetPlayerRole();
-  if (!HasRole(sink, role)) {
-    AwaitEnd(sink, GST_PAD_PROBE_INFO_BUFFER(info));
-    SetStreamProperties(sink, role);
+class RoleFollower {
+ public:
+  explicit RoleFollower(GstElement* sink) : sink_(sink) {}
+
+  static GstPadProbeReturn OnSound(GstPad* pad, GstPadProbeInfo* info, gpointer self) {
+    static_cast<RoleFollower*>(self)->Follow(pad, GST_PAD_PROBE_INFO_BUFFER(info));
+    return GST_PAD_PROBE_OK;
+  }
+
+ private:
+  /// A server's sink without a stream falls asleep, and is then two seconds late to the next one:
+  /// silence keeps it awake until the new stream is played.
+  void Follow(GstPad* pad, GstBuffer* sound) {
+    if (silence_.has_value() && GST_BUFFER_PTS(sound) - replacedAt_ > kSilenceAfter)
+      silence_.reset();
+    const char* role = GetPlayerRole();
+    if (HasRole(sink_, role)) return;
+    replacedAt_ = GST_BUFFER_PTS(sound);
+    silence_.emplace();
+    if (silence_->Connect()) silence_->PlaySilence();
+    AwaitEnd(sink_, sound);
+    SetStreamProperties(sink_, role);
     NoteStreamReplaced();
-    g_object_set_data(G_OBJECT(sink), kReplacing, sink);
+    g_object_set_data(G_OBJECT(sink_), kReplacing, sink_);
     const bool isReplaced = ReplaceStream(pad, role);
-    g_object_set_data(G_OBJECT(sink), kReplacing, nullptr);
+    g_object_set_data(G_OBJECT(sink_), kReplacing, nullptr);
     if (!isReplaced) {
-      GST_ELEMENT_ERROR(sink, RESOURCE, FAILED, ("The sound server makes no new stream"),
+      GST_ELEMENT_ERROR(sink_, RESOURCE, FAILED, ("The sound server makes no new stream"),
                         (nullptr));
     }
   }
-  return GST_PAD_PROBE_OK;
-}
+
+  GstElement* const sink_;
+  std::optional<ServerVisit> silence_;
+  GstClockTime replacedAt_ = 0;
+};
 
 /// A name of its own for each sink: sinks of one name share a connection, and with it the end of a
 /// server, which would keep new ones from the next server.
@@ -128,7 +184,9 @@ ElementPtr MakePulseSink() {
   g_object_set(sink.get(), "client-name", MakeClientName().c_str(), nullptr);
   SetStreamProperties(sink.get(), GetPlayerRole());
   const PadPtr pad(gst_element_get_static_pad(sink.get(), "sink"));
-  gst_pad_add_probe(pad.get(), GST_PAD_PROBE_TYPE_BUFFER, OnSound, sink.get(), nullptr);
+  gst_pad_add_probe(pad.get(), GST_PAD_PROBE_TYPE_BUFFER, RoleFollower::OnSound,
+                    new RoleFollower(sink.get()),
+                    [](gpointer self) { delete static_cast<RoleFollower*>(self); });
   return sink;
 }
 

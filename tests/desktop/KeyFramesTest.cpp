@@ -51,6 +51,7 @@ constexpr Kind kKinds[] = {
     {"Matroska, H.264, no index", "noindex.mkv", 1},
     {"WebM, VP8", "vp8.webm"},
     {"WebM, VP8, scenes of uneven lengths", "scenes.webm", 2, 20033},
+    {"WebM, VP8, several key frames a cluster", "dense.webm", 1},
     {"WebM, VP9", "vp9.webm"},
     {"WebM, VP8, no index", "noindex.webm"},
     {"AVI, MPEG-4", "mpeg4.avi"},

@@ -1,5 +1,6 @@
 #include "Container.h"
 
+#include <algorithm>
 #include <cstdint>
 #include <fstream>
 #include <optional>
@@ -7,8 +8,8 @@
 namespace Desktop {
 namespace {
 
-/// More elements than that at a file's top aren't worth reading.
-constexpr int kElementLimit = 10000;
+/// More elements than that in one place aren't worth reading.
+constexpr int kElementLimit = 100000;
 
 /// Reads numbers in network order. Once something couldn't be read, everything fails.
 class Bytes {
@@ -16,8 +17,19 @@ class Bytes {
   explicit Bytes(const char* path) : file_(path, std::ios::binary) {}
 
   bool AreGood() const { return file_.good(); }
-  std::uint64_t GetPlace() { return static_cast<std::uint64_t>(file_.tellg()); }
-  void GoTo(std::uint64_t place) { file_.seekg(static_cast<std::streamoff>(place)); }
+  std::uint64_t GetPlace() const { return place_; }
+
+  /// A stream that is sent elsewhere forgets what it has read ahead, so a short way is read.
+  void GoTo(std::uint64_t place) {
+    constexpr std::uint64_t kShort = 4096;
+    const auto way = static_cast<std::streamoff>(place - place_);
+    if (place > place_ && place - place_ < kShort) {
+      file_.ignore(way);
+    } else if (place != place_) {
+      file_.seekg(static_cast<std::streamoff>(place));
+    }
+    place_ = place;
+  }
 
   std::uint64_t Read(std::uint64_t size) {
     std::uint64_t number = 0;
@@ -25,10 +37,14 @@ class Bytes {
     return number;
   }
 
-  unsigned ReadByte() { return static_cast<unsigned char>(file_.get()); }
+  unsigned ReadByte() {
+    ++place_;
+    return static_cast<unsigned char>(file_.get());
+  }
 
  private:
   std::ifstream file_;
+  std::uint64_t place_ = 0;
 };
 
 /// A fragmented MP4's index, if it has one, covers a part of it only.
@@ -75,64 +91,118 @@ std::optional<Element> ReadElement(Bytes& file) {
 }
 
 constexpr std::uint64_t kSegment = 0x18538067, kSeekHead = 0x114D9B74, kSeek = 0x4DBB,
-                        kSeekId = 0x53AB, kSeekPosition = 0x53AC, kCues = 0x1C53BB6B,
-                        kCluster = 0x1F43B675;
+                        kSeekId = 0x53AB, kSeekPosition = 0x53AC, kInfo = 0x1549A966,
+                        kTimestampScale = 0x2AD7B1, kTracks = 0x1654AE6B, kTrackNumber = 0xD7,
+                        kTrackType = 0x83, kCues = 0x1C53BB6B, kCueTime = 0xB3,
+                        kCueTrackPositions = 0xB7, kCueTrack = 0xF7, kCluster = 0x1F43B675;
 
-/// \return where an entry of the table of contents points to, if that is the index.
-std::optional<std::uint64_t> ReadEntry(Bytes& file, std::uint64_t end) {
-  std::uint64_t id = 0;
-  std::optional<std::uint64_t> place;
-  while (file.GetPlace() < end) {
-    const auto field = ReadElement(file);
-    if (!field || field->end - field->begin > 8) return std::nullopt;
-    const std::uint64_t value = file.Read(field->end - field->begin);
-    if (field->id == kSeekId) id = value;
-    if (field->id == kSeekPosition) place = value;
+/// Calls \p use with each element between two places, until it returns false.
+template <typename Use>
+void ForEach(Bytes& file, std::uint64_t begin, std::uint64_t end, Use use) {
+  file.GoTo(begin);
+  for (int i = 0; i < kElementLimit && file.GetPlace() < end; ++i) {
+    const auto element = ReadElement(file);
+    if (!element || !use(*element)) return;
+    file.GoTo(element->end);
   }
-  return id == kCues ? place : std::nullopt;
 }
 
-/// \return whether the table of contents points to an index that is there.
-bool PointsToCues(Bytes& file, const Element& contents, std::uint64_t segment) {
-  while (file.GetPlace() < contents.end) {
-    const auto entry = ReadElement(file);
-    if (!entry || entry->end > contents.end) return false;
-    if (entry->id == kSeek) {
-      if (const auto place = ReadEntry(file, entry->end)) {
-        file.GoTo(segment + *place);
-        return file.Read(4) == kCues;
-      }
-    }
-    file.GoTo(entry->end);
-  }
-  return false;
+std::uint64_t ReadNumber(Bytes& file, const Element& element) {
+  return file.Read(std::min<std::uint64_t>(element.end - element.begin, 8));
 }
+
+/// \return the number that stands in \p element under \p id, else \p otherwise
+std::uint64_t FindNumber(Bytes& file, const Element& element, std::uint64_t id,
+                         std::uint64_t otherwise = 0) {
+  std::uint64_t number = otherwise;
+  ForEach(file, element.begin, element.end, [&](const Element& field) {
+    if (field.id == id) number = ReadNumber(file, field);
+    return field.id != id;
+  });
+  return number;
+}
+
+/// What a Matroska file tells before its first cluster.
+struct Head {
+  std::optional<Element> cues;  // its index
+  std::uint64_t scale = GST_MSECOND;
+  std::uint64_t video = 0;  // of several pictures the first is played
+};
 
 /// A truncated file promises an index that it doesn't have; a live recording promises none.
-bool HasCues(Bytes& file) {
-  std::uint64_t segment = 0;
-  for (int i = 0; i < kElementLimit; ++i) {
-    const auto element = ReadElement(file);
-    if (!element || element->id == kCluster) return false;
-    switch (element->id) {
-      case kSegment: segment = element->begin; break;  // and on with what is in it
-      case kCues: return true;
-      case kSeekHead:
-        if (PointsToCues(file, *element, segment)) return true;
-        [[fallthrough]];
-      default: file.GoTo(element->end); break;
+std::optional<Element> FindCues(Bytes& file, std::uint64_t place) {
+  file.GoTo(place);
+  const auto element = ReadElement(file);
+  return element && element->id == kCues ? element : std::nullopt;
+}
+
+std::uint64_t FindVideo(Bytes& file, const Element& tracks) {
+  constexpr std::uint64_t kVideo = 1;
+  std::uint64_t number = 0;
+  ForEach(file, tracks.begin, tracks.end, [&](const Element& entry) {
+    if (FindNumber(file, entry, kTrackType) == kVideo) {
+      number = FindNumber(file, entry, kTrackNumber);
     }
-  }
-  return false;
+    return number == 0;
+  });
+  return number;
+}
+
+Head ReadHead(Bytes& file) {
+  Head head;
+  std::uint64_t segment = 0;
+  const auto readContents = [&](const Element& entry) {
+    const bool isOfCues = entry.id == kSeek && FindNumber(file, entry, kSeekId) == kCues;
+    if (isOfCues) head.cues = FindCues(file, segment + FindNumber(file, entry, kSeekPosition));
+    return true;
+  };
+  const auto read = [&](const Element& element) {
+    switch (element.id) {
+      case kSeekHead: ForEach(file, element.begin, element.end, readContents); break;
+      case kInfo: head.scale = FindNumber(file, element, kTimestampScale, head.scale); break;
+      case kTracks: head.video = FindVideo(file, element); break;
+      case kCues: head.cues = element; break;
+      default: break;
+    }
+    return element.id != kCluster;
+  };
+  ForEach(file, 0, UINT64_MAX, [&](const Element& element) {
+    segment = element.begin;
+    if (element.id == kSegment) ForEach(file, element.begin, element.end, read);
+    return element.id != kSegment;
+  });
+  return head;
+}
+
+/// \return the time stamps that the index of a Matroska file lists for its video.
+std::vector<FilmTime> ReadCues(Bytes& file, const Head& head) {
+  constexpr std::uint64_t kLongest = 1ULL << 62U;  // damage beyond any film
+  std::vector<FilmTime> times;
+  ForEach(file, head.cues->begin, head.cues->end, [&](const Element& point) {
+    std::uint64_t time = 0;
+    ForEach(file, point.begin, point.end, [&](const Element& field) {
+      if (field.id == kCueTime) time = ReadNumber(file, field) * head.scale;
+      const bool isOfVideo =
+          field.id == kCueTrackPositions && FindNumber(file, field, kCueTrack) == head.video;
+      if (isOfVideo && time < kLongest) times.push_back(static_cast<FilmTime>(time));
+      return true;
+    });
+    return true;
+  });
+  std::sort(times.begin(), times.end());
+  return times;
 }
 
 }  // namespace
 
-bool HasTrustedIndex(const std::string& demuxer, const char* path) {
-  if (demuxer == "avidemux") return true;
+OwnIndex ReadOwnIndex(const std::string& demuxer, const char* path) {
+  if (demuxer == "avidemux") return {true, {}};
   Bytes file(path);
-  if (demuxer == "qtdemux") return !IsFragmented(file);
-  return demuxer == "matroskademux" && HasCues(file);
+  if (demuxer == "qtdemux") return {!IsFragmented(file), {}};
+  if (demuxer != "matroskademux") return {};
+  const Head head = ReadHead(file);
+  if (!head.cues) return {};
+  return {true, ReadCues(file, head)};
 }
 
 bool HasOwnOrigin(const std::string& demuxer) {

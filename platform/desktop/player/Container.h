@@ -1,13 +1,23 @@
 /// \file
 #pragma once
 
+#include "FilmTime.h"
+
 #include <string>
+#include <vector>
 
 namespace Desktop {
 
-/// \return whether a file says itself where its key frames are, completely and truly, so that
-/// GStreamer's demuxer of that name can go there.
-bool HasTrustedIndex(const std::string& demuxer, const char* path);
+/// What a file's own index is worth.
+struct OwnIndex {
+  bool isTrusted = false;  ///< it is complete and true, so that GStreamer's demuxer can use it
+
+  /// The time stamps of the key frames that it lists, where the demuxer may miss some. Ascending.
+  std::vector<FilmTime> keyFrames;
+};
+
+/// \param demuxer the name of GStreamer's demuxer of the file
+OwnIndex ReadOwnIndex(const std::string& demuxer, const char* path);
 
 /// \return whether times in such a file count from some moment before its start.
 bool HasOwnOrigin(const std::string& demuxer);

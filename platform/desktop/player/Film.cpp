@@ -1,6 +1,5 @@
 #include "Film.h"
 
-#include "Container.h"
 #include "native/PlayerError.h"
 
 #include <Tizen/Base/Log.h>
@@ -17,14 +16,14 @@ Film::Film(const char* path, const std::atomic<int>& isUnwanted)
     : path_(path), isUnwanted_(isUnwanted) {}
 
 void Film::SetContainer(const std::string& demuxer, FilmTime first, FilmTime shift) {
-  isTrusted_ = HasTrustedIndex(demuxer, path_.c_str());
+  own_ = ReadOwnIndex(demuxer, path_.c_str());
   if (HasOwnOrigin(demuxer)) origin_ = first;
   if (IsLostBefore(demuxer)) floor_ = first;
   if (CountsFromZero(demuxer)) excess_ = shift;
 }
 
 FilmTime Film::FindDuration(FilmTime told) {
-  if (isTrusted_) return told - excess_;
+  if (IsTrusted()) return told - excess_;
   const KeyFrameIndex* index = FindIndex();
   return index == nullptr ? told : index->end - GetOrigin();
 }

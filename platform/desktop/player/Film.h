@@ -1,11 +1,13 @@
 /// \file
 #pragma once
 
+#include "Container.h"
 #include "KeyFrameIndex.h"
 
 #include <atomic>
 #include <optional>
 #include <string>
+#include <vector>
 
 namespace Desktop {
 
@@ -21,7 +23,11 @@ class Film {
   void SetContainer(const std::string& demuxer, FilmTime first, FilmTime shift);
 
   /// \return whether the file's own index leads a seek to a key frame.
-  bool IsTrusted() const { return isTrusted_; }
+  bool IsTrusted() const { return own_.isTrusted; }
+
+  /// \return the time stamps of key frames that the file's own index lists, where GStreamer may miss
+  /// some.
+  const std::vector<FilmTime>& GetListed() const { return own_.keyFrames; }
 
   /// \return whether the flags of frames tell key frames from others, also after a seek.
   bool HasTrueFlags() const { return origin_ < 0; }
@@ -53,7 +59,7 @@ class Film {
  private:
   const std::string path_;
   const std::atomic<int>& isUnwanted_;
-  bool isTrusted_ = false;
+  OwnIndex own_;
   FilmTime origin_ = -1;
   FilmTime floor_ = 0;
   FilmTime excess_ = 0;  // of the length that the demuxer tells

@@ -3,7 +3,9 @@
 
 #include "Gst.h"
 
+#include <algorithm>
 #include <optional>
+#include <vector>
 
 namespace Desktop {
 
@@ -20,6 +22,12 @@ struct TimeSpan {
 
   bool Holds(FilmTime time) const { return time >= from && time <= to; }
 };
+
+/// \return the last of \p times, which ascend, at or before \p time, or the first. There must be one.
+inline auto FindAtOrBefore(const std::vector<FilmTime>& times, FilmTime time) {
+  const auto after = std::upper_bound(times.begin(), times.end(), time);
+  return after == times.begin() ? after : after - 1;
+}
 
 /// \return the times that are as good as \p time.
 constexpr TimeSpan Around(FilmTime time) { return {time - kRounding, time + kRounding}; }

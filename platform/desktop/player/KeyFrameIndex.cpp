@@ -146,11 +146,6 @@ KeyFrameIndex Reader::TakeIndex() {
 
 }  // namespace
 
-std::vector<FilmTime>::const_iterator KeyFrameIndex::FindAtOrBefore(FilmTime time) const {
-  const auto after = std::upper_bound(keyFrames.begin(), keyFrames.end(), time);
-  return after == keyFrames.begin() ? after : after - 1;
-}
-
 std::optional<KeyFrameIndex> ReadKeyFrames(const char* path,
                                            std::optional<std::chrono::milliseconds> limit,
                                            const std::atomic<int>& isUnwanted) {

@@ -14,9 +14,6 @@ namespace Desktop {
 struct KeyFrameIndex {
   std::vector<FilmTime> keyFrames;  // ascending
   FilmTime end = 0;                 // of the last picture or sound
-
-  /// \return the last key frame at or before \p time, or the first one. There must be one.
-  std::vector<FilmTime>::const_iterator FindAtOrBefore(FilmTime time) const;
 };
 
 /// Reads all of a file, without decoding it. What of it can't be read is left out.

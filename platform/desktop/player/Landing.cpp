@@ -28,6 +28,7 @@ int Landing::LandAtOrBefore(FilmTime time, std::optional<Landed>* landed) {
   std::optional<Landed> reached;
   if (film_.IsTrusted()) {
     if (const int error = TryContainer(time, &reached)) return error;
+    if (const int error = CorrectByList(time, &reached)) return error;
   }
   const bool isThere = reached && (reached->time <= time ||
                                    (film_.FindIndex() != nullptr && IsFirst(reached->time)));
@@ -58,9 +59,29 @@ int Landing::TryContainer(FilmTime time, std::optional<Landed>* landed) {
   return PLAYER_ERROR_NONE;
 }
 
+/// A demuxer goes to the first key frame of a cluster, though the container lists all of them. Leaves
+/// \p landed empty when there is none where the list says so.
+int Landing::CorrectByList(FilmTime time, std::optional<Landed>* landed) {
+  const auto& listed = film_.GetListed();
+  const auto shown = pipeline_.GetShown();
+  if (!*landed || !shown || listed.empty()) return PLAYER_ERROR_NONE;
+  const FilmTime shift = static_cast<FilmTime>(shown->stamp) - shown->time;
+  FilmTime limit = time;
+  // Listed times are whole milliseconds: the key frame may be a little later, and then after the time.
+  for (int i = 0; i < 2; ++i) {
+    const FilmTime keyFrame = *FindAtOrBefore(listed, limit + shift) - shift;
+    if (*landed && Around(keyFrame).Holds((*landed)->time)) break;
+    landed->reset();
+    if (const int error = LandAt(keyFrame, landed)) return error;
+    if (!*landed || (*landed)->time <= time) break;
+    limit = keyFrame - 1;
+  }
+  return PLAYER_ERROR_NONE;
+}
+
 int Landing::LandByIndex(FilmTime time, std::optional<Landed>* landed) {
   const auto& keyFrames = film_.GetIndex()->keyFrames;
-  auto keyFrame = film_.GetIndex()->FindAtOrBefore(time);
+  auto keyFrame = FindAtOrBefore(keyFrames, time);
   for (int broken = 0; broken <= kBrokenLimit; ++broken, --keyFrame) {
     landed->reset();
     if (const int error = LandAt(*keyFrame, landed)) return error;
@@ -84,7 +105,7 @@ int Landing::LandAt(FilmTime keyFrame, std::optional<Landed>* landed) {
     const auto shown = pipeline_.GetShown();
     if (IsAtGate() && shown && !shown->isBroken && expected.Holds(shown->time)) {
       lead_ = lead;
-      *landed = Landed{keyFrame, true, false, begin};
+      *landed = Landed{film_.IsTrusted() ? shown->time : keyFrame, true, false, begin};
     }
     if (IsAtGate() || begin <= film_.GetFloor()) break;
   }
@@ -132,7 +153,7 @@ bool Landing::IsKeyFrame(const Shown& shown) const {
   const FilmTime begin = shown.time - static_cast<FilmTime>(shown.stamp - keyFrame->stamp);
   const KeyFrameIndex* index = film_.GetIndex();
   if (index == nullptr || index->keyFrames.empty()) return film_.HasTrueFlags();
-  return Around(begin).Holds(*index->FindAtOrBefore(begin + kRounding));
+  return Around(begin).Holds(*FindAtOrBefore(index->keyFrames, begin + kRounding));
 }
 
 int Landing::Seek(FilmTime time, GstSeekFlags manner, std::optional<TimeSpan> first) {
@@ -143,7 +164,7 @@ int Landing::Seek(FilmTime time, GstSeekFlags manner, std::optional<TimeSpan> fi
 bool Landing::IsFirst(FilmTime keyFrame) const {
   const KeyFrameIndex* index = film_.GetIndex();
   return index != nullptr && !index->keyFrames.empty() &&
-         index->FindAtOrBefore(keyFrame + kRounding) == index->keyFrames.begin();
+         FindAtOrBefore(index->keyFrames, keyFrame + kRounding) == index->keyFrames.begin();
 }
 
 }  // namespace Desktop

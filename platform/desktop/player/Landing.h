@@ -37,6 +37,7 @@ class Landing {
 
  private:
   int TryContainer(FilmTime time, std::optional<Landed>* landed);
+  int CorrectByList(FilmTime time, std::optional<Landed>* landed);
   int LandByIndex(FilmTime time, std::optional<Landed>* landed);
   int LandAt(FilmTime keyFrame, std::optional<Landed>* landed);
   int LandSomewhere(FilmTime time, std::optional<Landed>* landed);

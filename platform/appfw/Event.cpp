@@ -36,7 +36,9 @@ class _EventListeners {
   using Worker = Host::Worker<Firing>;
 
   static Worker& GetWorker() {
-    static Host::NeverDestroyed<Worker> worker(Deliver);
+    static Host::NeverDestroyed<Worker> worker([](Firing& item, Worker::Lock& lock) {
+      if (item.arg != nullptr) item.listeners->Deliver(std::move(item.arg), lock);
+    });
     return *worker;
   }
 
@@ -66,9 +68,8 @@ class _EventListeners {
   };
 
   static FireToListenerFunction FinalFireToListener(const _Event& event);
-  static void Deliver(Firing& item, Worker::Lock& lock);
 
-  void TellAll(std::unique_ptr<IEventArg>& arg, Worker::Lock& lock);
+  void Deliver(std::unique_ptr<IEventArg> arg, Worker::Lock& lock);
   void Tell(const IEventListener& listener, const IEventArg& arg) const noexcept;
   void DropPending();
 
@@ -157,14 +158,8 @@ void _EventListeners::DropPending() {
   }
 }
 
-void _EventListeners::Deliver(Firing& item, Worker::Lock& lock) {
-  Firing firing = std::move(item);
-  if (firing.arg == nullptr) return;
-  firing.listeners->TellAll(firing.arg, lock);
-}
-
 /// Tells the listeners, and frees the argument after the last one's call.
-void _EventListeners::TellAll(std::unique_ptr<IEventArg>& arg, Worker::Lock& lock) {
+void _EventListeners::Deliver(std::unique_ptr<IEventArg> arg, Worker::Lock& lock) {
   const std::uint64_t number = GetWorker().CountFinished();
   isBeingTold_ = true;
   for (std::size_t i = 0; i < entries_.size() && entries_[i].firstNumber <= number; ++i) {

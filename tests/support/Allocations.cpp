@@ -1,7 +1,10 @@
 #include "Allocations.h"
 
+#include <malloc.h>
+
 #include <atomic>
 #include <cstdlib>
+#include <cstring>
 #include <new>
 
 namespace {
@@ -38,7 +41,10 @@ void* operator new(std::size_t size, const std::nothrow_t&) noexcept {
   return Allocate(size, FailingAllocation::kLibrarys);
 }
 void operator delete(void* memory) noexcept {
-  if (memory != nullptr) live.fetch_sub(1, std::memory_order_relaxed);
+  if (memory == nullptr) return;
+  live.fetch_sub(1, std::memory_order_relaxed);
+  std::memset(memory, 0xA5, malloc_usable_size(memory));  // whoever still uses it is to notice
+  asm volatile("" : : "r"(memory) : "memory");            // to the compiler, nobody does
   std::free(memory);
 }
 void operator delete(void* memory, std::size_t) noexcept { operator delete(memory); }

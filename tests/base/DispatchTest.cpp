@@ -21,7 +21,7 @@ struct Dispatch : Event {
 using DispatchTest = LibraryTest;
 
 TEST_F(DispatchTest, ForeignListenersAndUnknownEventTypesAreLoggedAndSkipped) {
-  PlainSessionListener session;
+  SessionListener session;
   IAudioVolumeEventListener volume;
   _AudioSessionEventArg sessionArg;
   _AudioVolumeEventArg volumeArg;

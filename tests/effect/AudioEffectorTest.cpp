@@ -1,13 +1,13 @@
 #include "support/Operations.h"
 
 #include <climits>
+#include <tuple>
 
 namespace Zelkora::Media {
 namespace {
 
 using Values = std::vector<int>;
 
-constexpr char kFeature[] = "audio_effector";
 constexpr char kEffectorQuery[] =
     "SystemInfo::GetValue(http://developer.zelkora.example/tizen/feature/audio_effector)";
 
@@ -21,7 +21,6 @@ struct Kind {
 
   int End() const { return lowest + static_cast<int>(numbers.size()); }
   Values UnknownValues() const { return {INT_MIN, lowest - 1, End(), INT_MAX}; }
-  std::string Call() const { return enumeration + "()"; }
 };
 
 /// \return what a list holds; nothing when it is null
@@ -47,28 +46,8 @@ const Kind kPresets = {Get<AudioEffectPreset, &AudioEffector::GetSupportedEffect
                        {1, 0, 2, 3, 4, 5, 6, 7, 8, 9, 11, 12, 13, 14, 15, 10, 16, 17, 18, 19},
                        "player_audio_effect_foreach_supported_preset"};
 
-/// An operation on one effect or preset.
-struct ValueOperation {
-  std::string name, function;  // ours, the player's
-  const Kind& kind;
-  bool takesLevel = false;
-
-  result Perform(int value) const {
-    effect = AudioEffectType(value);
-    preset = AudioEffectPreset(value);
-    return kOperations.at("AudioEffector::" + name)().Result();
-  }
-  std::string Call(int number) const {
-    const std::string set = takesLevel ? ", " + std::to_string(level) : "";
-    return function + "(" + std::to_string(number) + set + ")";
-  }
-};
-const ValueOperation kValueOperations[] = {
-    {"SetEffectLevel", "player_audio_effect_set_value", kEffects, true},
-    {"GetEffectLevel", "player_audio_effect_get_value", kEffects},
-    {"GetEffectLevelRange", "player_audio_effect_get_value_range", kEffects},
-    {"SetEffectPreset", "player_audio_effect_set_preset", kPresets},
-};
+/// What an operation finds in its arguments, and leaves there unless it answers.
+constexpr std::pair kUnwritten(999, 999);
 
 class EffectorTest : public LibraryTest {
  protected:
@@ -80,62 +59,65 @@ class EffectorTest : public LibraryTest {
 
 TEST_F(EffectorTest, FeatureIsAskedForFirstAndASecondConstructChangesNothing) {
   Tizen::Media::Player neverConstructed;
-  Host::SetFeature(kFeature, Host::kFeatureAbsent);
+  Host::SetFeature("audio_effector", Host::kFeatureAbsent);
   EXPECT_EQ(effector->Construct(neverConstructed), E_UNSUPPORTED_OPERATION);
-  Host::SetFeature(kFeature, E_SUCCESS);
+  Host::SetFeature("audio_effector", E_SUCCESS);
   EXPECT_EQ(effector->Construct(neverConstructed), E_INVALID_STATE);
   EXPECT_EQ(Host::TakeCalls(), (Lines{kEffectorQuery, kEffectorQuery}));
   EXPECT_EQ(effector->ResetAllToDefault(), E_SUCCESS);
 }
 
 TEST_F(EffectorTest, PlayerIsSupportedWithAnyKnownEffectOrPreset) {
-  const struct {
-    Simulated::Effects effects;
-    const Kind* refused;
-    result expected;
-  } rows[] = {{{{3}, {}}, nullptr, E_SUCCESS},
-              {{{}, {1}}, nullptr, E_SUCCESS},
-              {{{6}, {20}}, nullptr, E_UNSUPPORTED_OPERATION},
-              {{{1}, {}}, &kEffects, E_UNSUPPORTED_OPERATION},
-              {{{1}, {1}}, &kPresets, E_SUCCESS}};
-  for (const auto& row : rows) {
+  const std::tuple<Values, Values, result> rows[] = {
+      {{3}, {}, E_SUCCESS}, {{}, {1}, E_SUCCESS}, {{6}, {20}, E_UNSUPPORTED_OPERATION}};
+  for (const auto& [effects, presets, expected] : rows) {
     AudioEffector another;
-    Simulated::SetEffects(row.effects);
-    if (row.refused != nullptr) Host::FailCall(row.refused->enumeration.c_str(), -1, 1);
+    Simulated::SetEffects({effects, presets});
     Forget();
-    EXPECT_EQ(another.Construct(*player), row.expected);
-    EXPECT_EQ(GetLastResult(), row.expected);
+    EXPECT_EQ(another.Construct(*player), expected);
+    EXPECT_EQ(GetLastResult(), expected);
     EXPECT_EQ(Host::TakeCalls(), (Lines{kEffectorQuery, "_PlayerImpl::GetInstance()",
-                                        kEffects.Call(), kPresets.Call()}));
+                                        kEffects.enumeration + "()", kPresets.enumeration + "()"}));
   }
 }
 
 TEST_F(EffectorTest, KnownValuesAloneReachThePlayerUnderItsNumbers) {
-  for (const ValueOperation& operation : kValueOperations) {
-    SCOPED_TRACE(operation.function);
-    const Kind& kind = operation.kind;
-    for (int value = kind.lowest; value < kind.End(); ++value) {
+  const struct {
+    std::string name, function;
+    const Kind& kind;
+    std::pair<int, int> (*answer)(int);
+  } rows[] = {
+      {"SetEffectLevel", "player_audio_effect_set_value", kEffects, [](int) { return kUnwritten; }},
+      {"GetEffectLevel", "player_audio_effect_get_value", kEffects,
+       [](int value) { return std::pair(value, 999); }},
+      {"GetEffectLevelRange", "player_audio_effect_get_value_range", kEffects,
+       [](int value) { return value < 3 ? std::pair(-12, 12) : std::pair(0, 100); }},
+      {"SetEffectPreset", "player_audio_effect_set_preset", kPresets,
+       [](int) { return kUnwritten; }},
+  };
+  for (const auto& [name, function, kind, answer] : rows) {
+    const auto& perform = kOperations.at("AudioEffector::" + name);
+    const auto expect = [&](int value, result r, const Lines& calls, std::pair<int, int> written) {
+      SCOPED_TRACE(function + " " + std::to_string(value));
+      effect = AudioEffectType(value);
+      preset = AudioEffectPreset(value);
       level = value;
-      low = high = 0;
-      EXPECT_EQ(operation.Perform(value), E_SUCCESS);
-      EXPECT_EQ(GetLastResult(), E_SUCCESS);
-      EXPECT_EQ(Host::TakeCalls(),
-                Lines{operation.Call(kind.numbers[std::size_t(value - kind.lowest)])});
-      const bool isRange = operation.name == "GetEffectLevelRange";
-      const bool isGet = operation.name == "GetEffectLevel";
-      EXPECT_EQ(low, isRange ? (value < 3 ? -12 : 0) : isGet ? value : 0);
-      EXPECT_EQ(high, isRange ? (value < 3 ? 12 : 100) : 0);
-    }
-    low = 9;
-    for (const int value : kind.UnknownValues()) {
-      EXPECT_EQ(operation.Perform(value), E_INVALID_ARG);
-      EXPECT_EQ(Host::TakeCalls(), Lines());
-      EXPECT_EQ(low, 9);
+      std::tie(low, high) = kUnwritten;
+      EXPECT_EQ(perform().Result(), r);
+      EXPECT_EQ(Host::TakeCalls(), calls);
+      EXPECT_EQ(std::pair(low, high), written);
+    };
+    for (const int value : kind.UnknownValues()) expect(value, E_INVALID_ARG, {}, kUnwritten);
+    for (int value = kind.lowest; value < kind.End(); ++value) {
+      const std::string number = std::to_string(kind.numbers[std::size_t(value - kind.lowest)]);
+      const std::string set = name == "SetEffectLevel" ? ", " + std::to_string(value) : "";
+      expect(value, E_SUCCESS, {function + "(" + number + set + ")"}, answer(value));
     }
   }
+  effect = AUDIO_EFFECT_TREBLE;
   level = INT_MIN;  // the player judges levels
-  EXPECT_EQ(kValueOperations[0].Perform(2), E_INVALID_ARG);
-  EXPECT_EQ(Host::TakeCalls(), Lines{kValueOperations[0].Call(2)});
+  EXPECT_EQ(kOperations.at("AudioEffector::SetEffectLevel")().Result(), E_INVALID_ARG);
+  EXPECT_EQ(Host::TakeCalls(), Lines{"player_audio_effect_set_value(2, -2147483648)"});
 }
 
 TEST_F(EffectorTest, ResetClearsTheEffectsInOrderThenSelectsTheNeutralPreset) {
@@ -154,29 +136,25 @@ TEST_F(EffectorTest, ResetClearsTheEffectsInOrderThenSelectsTheNeutralPreset) {
 TEST_F(EffectorTest, ListHoldsTheKnownValuesInThePlayersOrderAndIsNullWhenThePlayerFails) {
   for (const Kind* kind : {&kEffects, &kPresets}) {
     SCOPED_TRACE(kind->enumeration);
-    log.Take();
-    Simulated::Effects effects;
-    Values& reported = effects.*(kind->reported);
-    reported = kind->UnknownValues();
+    const auto listOf = [kind](const Values& reported, int error) {
+      Simulated::Effects effects;
+      effects.*(kind->reported) = reported;
+      effects.enumerationError = error;
+      Simulated::SetEffects(effects);
+      SetLastResult(kUntouched);
+      return kind->get(*effector);
+    };
+    Values reported = kind->UnknownValues(), known;
     reported.insert(reported.end(), kind->numbers.begin(), kind->numbers.end());
     reported.push_back(kind->numbers.front());  // again
-    Values known;
     for (int value = kind->lowest; value < kind->End(); ++value) known.push_back(value);
     known.push_back(kind->lowest);
-    Simulated::SetEffects(effects);
-    EXPECT_EQ(kind->get(*effector), known);
+    log.Take();
+    EXPECT_EQ(listOf(reported, 0), known);
     EXPECT_EQ(log.Take().size(), 4u);  // one for each that isn't known
-
-    SetLastResult(kUntouched);
-    reported = {};
-    Simulated::SetEffects(effects);
-    EXPECT_EQ(kind->get(*effector), Values());
+    EXPECT_EQ(listOf({}, 0), Values());
     EXPECT_EQ(GetLastResult(), kUntouched);
-
-    reported = {1, 2};
-    effects.enumerationError = -22;
-    Simulated::SetEffects(effects);
-    EXPECT_EQ(kind->get(*effector), std::nullopt);
+    EXPECT_EQ(listOf({1, 2}, -22), std::nullopt);
     EXPECT_EQ(GetLastResult(), E_INVALID_ARG);
   }
 }

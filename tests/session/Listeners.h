@@ -6,24 +6,20 @@
 
 namespace Zelkora::Media {
 
-/// Writes down what it hears; not `OnAudioSessionDisrupted`, which has a default.
-class PlainSessionListener : public IAudioSessionEventListener {
+/// Writes down what it hears.
+class SessionListener : public IAudioSessionEventListener {
  public:
-  void OnAudioSessionInterruptStarted() override { heard += "started "; }
-  void OnAudioSessionInterruptFinished() override { heard += "finished "; }
+  void OnAudioSessionInterruptStarted() override { heard_ += "started "; }
+  void OnAudioSessionInterruptFinished() override { heard_ += "finished "; }
+  void OnAudioSessionDisrupted() override { heard_ += "disrupted "; }
 
   std::string TakeHeard() {
     Host::WaitUntilDelivered();
-    return std::exchange(heard, "");
+    return std::exchange(heard_, "");
   }
 
- protected:
-  std::string heard;
-};
-
-class SessionListener : public PlainSessionListener {
- public:
-  void OnAudioSessionDisrupted() override { heard += "disrupted "; }
+ private:
+  std::string heard_;
 };
 
 }  // namespace Zelkora::Media

@@ -87,13 +87,6 @@ class ManagerTest : public LibraryTest {
  protected:
   ManagerTest() { Forget(); }
 
-  /// Expects what an operation left behind that passed the gate, with its calls behind that.
-  void ExpectLeftBehindGate(result last, const Lines& lines, Lines calls = {},
-                            int line = __builtin_LINE()) {
-    calls.insert(calls.begin(), PrivilegeQuery<Manager>());
-    ExpectLeft(last, lines, calls, line);
-  }
-
   Manager& manager = *Manager::GetInstance();
 };
 

@@ -25,12 +25,10 @@ using CallDevice = ManagerTest<Call>;
 
 TEST_F(CallDevice, ModeThatIsNotKnownIsReadAsNone) {
   ASSERT_EQ(manager.EnterCallSession(), E_SUCCESS);
-  Forget();
-  const std::pair<int, int> rows[] = {{0, 1},  {1, 2},       {2, 3},      {3, 0},
-                                      {-1, 0}, {INT_MAX, 0}, {INT_MIN, 0}};
-  for (const auto& [reported, mode] : rows) {
-    reportedMode = reported;
-    EXPECT_EQ(manager.GetCallSessionMode(), mode) << reported;
+  for (const int unknown : {3, -1, INT_MAX, INT_MIN}) {
+    reportedMode = unknown;
+    SetLastResult(kUntouched);
+    EXPECT_EQ(manager.GetCallSessionMode(), VOIP_AUDIO_SESSION_MODE_NONE) << unknown;
     EXPECT_EQ(GetLastResult(), kUntouched);
   }
   EXPECT_EQ(manager.ExitCallSession(), E_SUCCESS);

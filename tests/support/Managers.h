@@ -50,7 +50,6 @@ template <>
 struct Facts<Session> {
   static constexpr char kName[] = "AudioSessionManager";
   static constexpr char kPrivilege[] = "audiomanager.session";
-  static Lines Callbacks() { return {"session_interrupted"}; }
   static void Use(Session& manager) { manager.GetMode(); }
 };
 
@@ -58,7 +57,6 @@ template <>
 struct Facts<Call> {
   static constexpr char kName[] = "VoipAudioSessionManager";
   static constexpr char kPrivilege[] = "audiomanager.voipsession";
-  static Lines Callbacks() { return {}; }
   static void Use(Call& manager) { manager.GetCallSessionMode(); }
 };
 
@@ -66,7 +64,6 @@ template <>
 struct Facts<Volume> {
   static constexpr char kName[] = "AudioVolumeManager";
   static constexpr char kPrivilege[] = "audiomanager.volume";
-  static Lines Callbacks() { return {"volume_changed", "muteall_changed"}; }
   static void Use(Volume& manager) { manager.GetMuteStatus(); }
 };
 

@@ -1,8 +1,8 @@
 // The events' dispatch, which only the platform calls. The library's sources are part of this program.
 
+#include "managers/Listeners.h"
 #include "session/AudioSessionEvent.h"
 #include "session/AudioSessionEventArg.h"
-#include "session/Listeners.h"
 #include "volume/AudioVolumeEvent.h"
 #include "volume/AudioVolumeEventArg.h"
 

@@ -1,10 +1,26 @@
 /// \file
-/// What hears the volume manager in tests.
+/// What hears the managers in tests.
 #pragma once
 
 #include "support/Managers.h"
 
 namespace Zelkora::Media {
+
+/// Writes down what it hears.
+class SessionListener : public IAudioSessionEventListener {
+ public:
+  void OnAudioSessionInterruptStarted() override { heard_ += "started "; }
+  void OnAudioSessionInterruptFinished() override { heard_ += "finished "; }
+  void OnAudioSessionDisrupted() override { heard_ += "disrupted "; }
+
+  std::string TakeHeard() {
+    Host::WaitUntilDelivered();
+    return std::exchange(heard_, "");
+  }
+
+ private:
+  std::string heard_;
+};
 
 /// Writes down everything that it hears.
 class VolumeListener : public IAudioVolumeEventListener {

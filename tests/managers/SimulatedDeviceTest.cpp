@@ -8,11 +8,7 @@
 #include <climits>
 #include <deque>
 
-namespace {
-
-int reportedMode = 0;
-
-}  // namespace
+static int reportedMode = 0;
 
 /// A device whose call sessions report any mode: the library finds this one first.
 int sound_manager_call_session_get_mode(sound_call_session_h, int* mode) {

@@ -25,6 +25,7 @@ using testing::AllOf;
 using testing::ContainsRegex;
 using testing::EndsWith;
 using testing::HasSubstr;
+using testing::MatchesRegex;
 using testing::Not;
 using testing::StartsWith;
 using Text = testing::Matcher<const std::string&>;
@@ -65,20 +66,18 @@ class CommandLine : public testing::Test {
   fs::path folder_;
 };
 
-TEST_F(CommandLine, UsageAndVersionArePrintedWithSuccess) {
+TEST_F(CommandLine, UsageIsPrintedOnRequestAndExplainedOnStandardErrorWhenItIsWrong) {
   Expect("$Z --help", 0, HasSubstr("filmstrip"));
   Expect("$Z filmstrip --help", 0, HasSubstr("strip.png"));
   Expect("$Z --version", 0, StartsWith("zelkora "));
-}
-
-TEST_F(CommandLine, UsageThatIsWrongIsExplainedOnStandardErrorAndExitsWith2) {
   for (const auto& [options, reason] : {std::pair{"", "no command"},
-                                        {"frob", "frob"},
+                                        {"frob a b", "no command 'frob'"},
                                         {"seek a.mp4", "POSITION"},
                                         {"seek a.mp4 1.5", "1.5s"},
                                         {"seek a.mp4 1:60", "'1:60'"},
                                         {"seek a.mp4 1:2:3:4", "'1:2:3:4'"},
                                         {"seek a.mp4 1 --x", "no option '--x'"},
+                                        {"seek a.mp4 --keys 4200", "--keys"},
                                         {"filmstrip a.mp4 b open", "'b open'"},
                                         {"filmstrip a.mp4 -o a.jpg", "'a.jpg' doesn't end in .png"},
                                         {"monitor --count 0", "'0' is no whole number from 1"},
@@ -86,7 +85,6 @@ TEST_F(CommandLine, UsageThatIsWrongIsExplainedOnStandardErrorAndExitsWith2) {
                                         {"volume medi", "system, notification"},
                                         {"volume media x", "write 9, +1, -2 or 60%"},
                                         {"volume media +5%", "write 9"},
-                                        {"frob a b", "no command 'frob'"},
                                         {"call --mode voice media", "--for"},
                                         {"effects --set bass", "like bass=6"},
                                         {"effects --render a.wav", "FILE"},
@@ -95,7 +93,7 @@ TEST_F(CommandLine, UsageThatIsWrongIsExplainedOnStandardErrorAndExitsWith2) {
   }
 }
 
-TEST_F(CommandLine, SeekPrintsWhereEachPositionLandsAndFailsOutsideTheFileInThatRowAlone) {
+TEST_F(CommandLine, SeekPrintsWhereEachPositionLandsAndWhyOneDoesNot) {
   Expect("$Z seek a.mp4 0 4200 59999", 0,
          " asked  landed  key frame\n"
          "     0       0  yes\n"
@@ -112,41 +110,18 @@ TEST_F(CommandLine, SeekPrintsWhereEachPositionLandsAndFailsOutsideTheFileInThat
                HasSubstr("\nzelkora: cannot move to 12345678 ms: ")));
   Expect("$Z --verbose seek a.mp4 -1", 1, HasSubstr("E_INVALID_ARG"),
          HasSubstr("debug module=60 result=E_INVALID_ARG"));
-}
-
-TEST_F(CommandLine, SeekListsAllKeyFrames) {
   Expect("$Z seek a.mp4 --keys", 0, AllOf(StartsWith("0\n2000\n4000\n"), EndsWith("\n60000\n")));
-  Expect("$Z seek a.mp4 --keys 4200", 2, "", HasSubstr("--keys"));
-}
-
-TEST_F(CommandLine, SeekWithoutAReaderFailsQuietlyAndOnAFullDiskInWords) {
   Expect("$Z seek a.mp4 0 1 2 >&-", 1, "");
   Expect("$Z seek a.mp4 0 1 2 >/dev/full", 1, "",
          "zelkora: cannot write to standard output: No space left on device\n");
-}
-
-TEST_F(CommandLine, SeekInAFileThatCannotBeOpenedTellsWhyOnce) {
+  Expect("$Z seek '' 0", 1, "", MatchesRegex("zelkora: .* \\(E_INVALID_ARG\\)\n"));
 #ifdef WITH_DESKTOP
   Expect("$D seek missing.mp4 0", 1, "",
-         testing::MatchesRegex("zelkora: cannot open missing.mp4: .* \\(E_OBJ_NOT_FOUND\\)\n"));
-#else
-  Expect("$Z seek '' 0", 1, "", testing::MatchesRegex("zelkora: .* \\(E_INVALID_ARG\\)\n"));
+         MatchesRegex("zelkora: cannot open missing.mp4: .* \\(E_OBJ_NOT_FOUND\\)\n"));
 #endif
 }
 
-TEST_F(CommandLine, FilmstripHasEachKeyFrameOnce) {
-  for (const auto& [options, strip, note] :
-       {std::tuple{"-n 1", "1 frame, 272 x 193", ""},
-        {"", "12 frames, 1552 x 370", ""},
-        {"-n 500", "30 frames, 1552 x 901",
-         "zelkora: note: the video has only 30 key frames near the 500 positions\n"}}) {
-    Expect("$Z filmstrip a.mp4 " + std::string(options), 0,
-           "strip.png: " + std::string(strip) + " pixels\n", note);
-    EXPECT_THAT(Read(folder_ / "strip.png"), StartsWith("\x89PNG\r\n"));
-  }
-}
-
-TEST_F(CommandLine, FilmstripThatCannotBeWrittenLeavesNothing) {
+TEST_F(CommandLine, FilmstripHasEachKeyFrameOnceOrLeavesNothing) {
   Expect("mkdir folder.png; ln -s /dev/null null.png", 0, "");
   for (const std::string output : {"missing/strip.png", "folder.png", "null.png"}) {
     Expect("$Z filmstrip a.mp4 -o " + output, 1, "",
@@ -156,6 +131,15 @@ TEST_F(CommandLine, FilmstripThatCannotBeWrittenLeavesNothing) {
   Expect("(ulimit -f 0; trap '' XFSZ; $Z filmstrip a.mp4 2>&1) | cat", 0,
          "zelkora: cannot write strip.png: File too large\n");
   Expect("ls -A", 0, "folder.png\nnull.png\n");
+  for (const auto& [options, strip, note] :
+       {std::tuple{"-n 1", "1 frame, 272 x 193", ""},
+        {"", "12 frames, 1552 x 370", ""},
+        {"-n 500", "30 frames, 1552 x 901",
+         "zelkora: note: the video has only 30 key frames near the 500 positions\n"}}) {
+    Expect("$Z filmstrip a.mp4 " + std::string(options), 0,
+           "strip.png: " + std::string(strip) + " pixels\n", note);
+    EXPECT_THAT(Read(folder_ / "strip.png"), StartsWith("\x89PNG\r\n"));
+  }
 }
 
 TEST_F(CommandLine, WhatIsReadIsNeverWrittenOver) {
@@ -195,6 +179,9 @@ TEST_F(CommandLine, ManagersAreShownAndSetAndRefusalsExplained) {
   Expect("$Z volume media +1", 0, "media             8       15  ##########..........\n");
   Expect("$Z volume media -9", 0, HasSubstr(" 0 "));
   Expect("$Z volume media 60%", 0, HasSubstr(" 9 "));
+  int highest = 0;
+  const int unnamed = static_cast<int>(std::size(::CommandLine::kCategories));
+  EXPECT_NE(sound_manager_get_max_volume(unnamed, &highest), 0) << "a category has no name";
   Expect("$Z mute", 0, "off\n");
   Expect("$Z mute on", 0, "");
   Expect("$Z session", 0, "media\n");
@@ -262,18 +249,13 @@ TEST_F(CommandLine, EffectsAreChangedInTheOrderGivenAndRefusedOutsideTheirRange)
   }
   Expect("$Z effects --set bass=13", 1, "",
          StartsWith("zelkora: cannot set bass 13: level 13 is outside"));
-}
-
-TEST_F(CommandLine, EverythingThatTheDeviceHasIsCalledByItsName) {
-  std::size_t types = 0;
-  for (int highest; sound_manager_get_max_volume(static_cast<int>(types), &highest) == 0;) ++types;
-  EXPECT_EQ(std::size(::CommandLine::kCategories), types);
-  Expect("$Z effects", 0, Not(ContainsRegex("(\n|presets:.* )[0-9]")));
+  Expect("$Z effects", 0, Not(ContainsRegex("(\n|presets:.* )[0-9]")));  // all have names
 }
 
 TEST_F(CommandLine, EffectsArePlottedAndLeaveNoFileWhereTheyCannotBeHeard) {
-  Expect("$Z effects a.ogg --render b.wav", 1, StartsWith("effect"), StartsWith("zelkora: "));
-  Expect("$Z effects --plot b.svg", 1, StartsWith("effect"), StartsWith("zelkora: "));
+  for (const std::string output : {"a.ogg --render b.wav", "--plot b.svg"}) {
+    Expect("$Z effects " + output, 1, StartsWith("effect"), StartsWith("zelkora: "));
+  }
   EXPECT_TRUE(fs::is_empty(folder_));
 #ifdef WITH_DESKTOP
   Expect("$D effects --set bass=6 --plot a.png", 0, HasSubstr("a.png: bass 6"));

@@ -1,6 +1,6 @@
-// What an event costs from the native callback to the listeners, against a queue that one would write
-// by hand: one closure an event, and the same cast of the listener. Prints ratios of processor time,
-// medians, both sides taking turns within one run.
+// What an event costs from the native callback to the listeners, against a queue that one would
+// write by hand: one closure an event, and the same cast of the listener. Prints ratios of
+// processor time, medians, both sides taking turns within one run.
 
 #include <Host/Events.h>
 #include <Zelkora/Media/AudioVolumeManager.h>

@@ -1,6 +1,6 @@
 // Compares a seek through the library with the plain key-frame seek of a hand-made pipeline, both
-// paused and on the same positions, and fails when the library's share is above a limit. Of a file whose
-// container has no index, it measures the first seek, which makes one, and the others.
+// paused and on the same positions, and fails when the library's share is above a limit. Of a file
+// whose container has no index, it measures the first seek, which makes one, and the others.
 
 #include <Tizen/Media/Player.h>
 #include <Zelkora/Media/VideoKeyFrameSeeker.h>

@@ -211,8 +211,8 @@ class LibraryListener : public Zelkora::Media::IAudioVolumeEventListener {
   Waiter& waiter_;
 };
 
-// Each of these runs in a process of its own, so that no side makes work for another. It prints what
-// was measured and the time.
+// Each of these runs in a process of its own, so that no side makes work for another. It prints
+// what was measured and the time.
 
 void Print(const std::string& name, double time) { std::printf("%s %f\n", name.c_str(), time); }
 

@@ -1,5 +1,5 @@
-// What the music player does when it is interrupted. Linked with the simulated device, which does what
-// it is told and calls the listeners before the next line.
+// What the music player does when it is interrupted. Linked with the simulated device, which does
+// what it is told and calls the listeners before the next line.
 
 #include "MusicPlayer.h"
 

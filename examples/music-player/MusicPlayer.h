@@ -6,11 +6,11 @@
 
 #include <mutex>
 
-/// Keeps the volume that its user chose, pauses on an interruption, resumes afterwards only if it was
-/// playing, and plays on without what it isn't permitted to do.
+/// Keeps the volume that its user chose, pauses on an interruption, resumes afterwards only if it
+/// was playing, and plays on without what it isn't permitted to do.
 ///
-/// To live as long as the program: the managers are deleted at exit and call no listener any more, so
-/// it needn't be taken back from them, which could be refused.
+/// To live as long as the program: the managers are deleted at exit and call no listener any more,
+/// so it needn't be taken back from them, which could be refused.
 class MusicPlayer : public Zelkora::Media::IAudioSessionEventListener,
                     public Zelkora::Media::IAudioVolumeEventListener {
  public:

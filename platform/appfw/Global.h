@@ -10,13 +10,13 @@
 
 namespace Host {
 
-/// The one object of a type, under a lock, for all threads until the process is gone. Nobody holds the
-/// lock while the process forks, so a child finds it free and the object whole.
+/// The one object of a type, under a lock, for all threads until the process is gone. Nobody holds
+/// the lock while the process forks, so a child finds it free and the object whole.
 template <typename T>
 class Global {
  public:
-  /// Runs \p operation on the object; it must not use other globals. Throws `std::bad_alloc` when the
-  /// object can't be made.
+  /// Runs \p operation on the object; it must not use other globals. Throws `std::bad_alloc` when
+  /// the object can't be made.
   template <typename Operation>
   static auto Use(Operation operation) {
     Global& global = The();

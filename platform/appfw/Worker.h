@@ -65,8 +65,8 @@ class Worker {
   /// \return whether \p callee is being called; the lock must be held.
   bool IsCalling(const void* callee) const { return calling_ == callee; }
 
-  /// Waits until \p condition, which the end of a delivery or of a call changes, is false. At once on
-  /// the worker's own thread.
+  /// Waits until \p condition, which the end of a delivery or of a call changes, is false. At once
+  /// on the worker's own thread.
   template <typename Condition>
   void WaitWhile(Lock& lock, Condition condition);
 

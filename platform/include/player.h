@@ -58,8 +58,8 @@ int player_is_key_frame(player_h player, bool* key_frame);
 /// Receives the position of a key frame. \return true to go on, false to stop
 typedef bool (*player_key_frame_cb)(long position, void* user_data);
 
-/// Tells the positions of all key frames, in ascending order, on the calling thread. Reads the whole
-/// file, and takes as long as that needs; closing the player meanwhile ends it with an error.
+/// Tells the positions of all key frames, in ascending order, on the calling thread. Reads the
+/// whole file, and takes as long as that needs; closing the player meanwhile ends it with an error.
 int player_foreach_key_frame(player_h player, player_key_frame_cb callback, void* user_data);
 
 /// Receives a picture: rows of three bytes a pixel (red, green, blue), \p stride bytes apart, valid

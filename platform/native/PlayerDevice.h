@@ -7,9 +7,9 @@
 #include <atomic>
 #include <functional>
 
-/// Functions that give an `int` return a native code, and tell why by `Host::PlayerFailure`; all but
-/// `Destroy` and `Close` may throw. Pointers and paths have been checked. Several players are used at
-/// once.
+/// Functions that give an `int` return a native code, and tell why by `Host::PlayerFailure`; all
+/// but `Destroy` and `Close` may throw. Pointers and paths have been checked. Several players are
+/// used at once.
 namespace PlayerDevice {
 
 /// The device's own part of a player.
@@ -41,9 +41,8 @@ int CaptureFrame(Player& player, player_frame_cb callback, void* userData);
 int RenderAudio(Player& player, const char* path);
 /// @}
 
-/// \name Sound effects
-/// At any time, also during the operations above. Levels are in the range, effects and presets aren't
-/// checked.
+/// \name Sound effects At any time, also during the operations above. Levels are in the range,
+/// effects and presets aren't checked.
 /// @{
 struct Range {
   int min;

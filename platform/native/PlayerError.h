@@ -22,8 +22,8 @@ inline result ConvertPlayerErrorToResult(int error) {
   }
 }
 
-/// While it lives, what fails on this thread is logged as a reason only, because whoever called logs
-/// the failure.
+/// While it lives, what fails on this thread is logged as a reason only, because whoever called
+/// logs the failure.
 class ReasonsOnly {
  public:
   ReasonsOnly();
@@ -36,9 +36,9 @@ class ReasonsOnly {
   const bool before_;
 };
 
-/// Logs why a player's function fails and gives back \p error, so that a failure is one statement. The
-/// last result belongs to those that call the native functions; it isn't touched.
-/// The message is put behind the code's name: "[E_INVALID_STATE] no file is open".
+/// Logs why a player's function fails and gives back \p error, so that a failure is one statement.
+/// The last result belongs to those that call the native functions; it isn't touched. The message
+/// is put behind the code's name: "[E_INVALID_STATE] no file is open".
 int PlayerFailure(int error, int line, const char* format, ...) noexcept
     __attribute__((format(printf, 3, 4)));
 

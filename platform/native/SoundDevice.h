@@ -4,9 +4,9 @@
 
 #include "Reports.h"
 
-/// All of it is called on any thread, by several at once. Functions that give an `int` return a native
-/// code; all may throw `std::bad_alloc` or `std::system_error`. Arguments have been checked: types are
-/// 0 to 5, levels 0 to the maximum, modes 0 to 2.
+/// All of it is called on any thread, by several at once. Functions that give an `int` return a
+/// native code; all may throw `std::bad_alloc` or `std::system_error`. Arguments have been checked:
+/// types are 0 to 5, levels 0 to the maximum, modes 0 to 2.
 ///
 /// A device reports each change through Reports.h, its own ones too, in the order of the changes.
 namespace SoundDevice {
@@ -27,8 +27,8 @@ void OnListening(Native::Kind kind, bool isListening);
 /// Returns when what has happened outside before has been reported, in bounded time.
 void AwaitReports();
 
-/// \param number receives the call's number, which is above 0 and never used again; untouched without
-/// a call
+/// \param number receives the call's number, which is above 0 and never used again; untouched
+/// without a call
 int OpenCall(int& number);
 int CloseCall(int number);
 int SetCallMode(int number, int mode);

@@ -23,8 +23,8 @@ void Check(result r, std::string_view attempt);
 /// Throws a `Failure` for the error number \p error of the system: "cannot write a.png: ...".
 [[noreturn]] void FailWithSystemError(std::string_view attempt, int error);
 
-/// Writes a line to standard error, with the program's name in front; on a terminal it breaks between
-/// words.
+/// Writes a line to standard error, with the program's name in front; on a terminal it breaks
+/// between words.
 void PrintError(std::string_view text) noexcept;
 
 }  // namespace CommandLine

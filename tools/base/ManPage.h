@@ -6,7 +6,8 @@
 
 namespace CommandLine {
 
-/// \return the manual's page of the program, with all its commands and those of its shell, as troff.
+/// \return the manual's page of the program, with all its commands and those of its shell, as
+/// troff.
 std::string ManPage(const CLI::App& program, const CLI::App& shell);
 
 }  // namespace CommandLine

@@ -8,7 +8,8 @@
 /// Positions, levels and numbers, as the user types them. The validators are CLI11's.
 namespace CommandLine {
 
-/// \return the milliseconds in "1500", "1500ms", "90s", "1.5s", "1:30" or "1:02:03.5", if it is one.
+/// \return the milliseconds in "1500", "1500ms", "90s", "1.5s", "1:30" or "1:02:03.5", if it is
+/// one.
 std::optional<long> ToMilliseconds(const std::string& text);
 
 CLI::Validator IsPosition();

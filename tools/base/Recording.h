@@ -7,8 +7,8 @@
 
 namespace CommandLine {
 
-/// Writes what `Events` tells as a scenario: on the simulated device the shell plays it back, and the
-/// same is heard.
+/// Writes what `Events` tells as a scenario: on the simulated device the shell plays it back, and
+/// the same is heard.
 class Recording {
  public:
   /// \param mode the session's mode, set before; "" for none

@@ -15,8 +15,8 @@ struct ResponsePoint {
 /// From 20 Hz to 20 kHz, ascending.
 using FrequencyResponse = std::vector<ResponsePoint>;
 
-/// \return white noise, the same each time and different on both sides; quiet enough to be amplified
-/// without being limited.
+/// \return white noise, the same each time and different on both sides; quiet enough to be
+/// amplified without being limited.
 StereoSound MakeNoise();
 
 /// Compares two recordings of that noise. Throws a `Failure` when one is too short.

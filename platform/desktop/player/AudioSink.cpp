@@ -56,8 +56,8 @@ class ServerVisit {
            WaitUntil([this] { return pa_context_get_state(context_.get()) == PA_CONTEXT_READY; });
   }
 
-  /// Begins to play silence, which goes on as long as this lives: a server plays it for a stream that
-  /// isn't fed. \return whether the server plays it
+  /// Begins to play silence, which goes on as long as this lives: a server plays it for a stream
+  /// that isn't fed. \return whether the server plays it
   bool PlaySilence() {
     constexpr pa_sample_spec kFormat = {PA_SAMPLE_S16NE, 8000, 1};
     constexpr auto kAsItLikes = static_cast<std::uint32_t>(-1);
@@ -129,8 +129,8 @@ bool ReplaceStream(GstPad* pad, const char* role) {
   return gst_pad_send_event(pad, gst_event_new_caps(marked.get()));
 }
 
-/// Has a sink's stream follow the session's role. On the streaming thread, which alone uses the sink's
-/// properties by then.
+/// Has a sink's stream follow the session's role. On the streaming thread, which alone uses the
+/// sink's properties by then.
 class RoleFollower {
  public:
   explicit RoleFollower(GstElement* sink) : sink_(sink) {}

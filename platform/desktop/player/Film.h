@@ -25,8 +25,8 @@ class Film {
   /// \return whether the file's own index leads a seek to a key frame.
   bool IsTrusted() const { return own_.isTrusted; }
 
-  /// \return the time stamps of key frames that the file's own index lists, where GStreamer may miss
-  /// some.
+  /// \return the time stamps of key frames that the file's own index lists, where GStreamer may
+  /// miss some.
   const std::vector<FilmTime>& GetListed() const { return own_.keyFrames; }
 
   /// \return whether the flags of frames tell key frames from others, also after a seek.

@@ -23,7 +23,8 @@ struct TimeSpan {
   bool Holds(FilmTime time) const { return time >= from && time <= to; }
 };
 
-/// \return the last of \p times, which ascend, at or before \p time, or the first. There must be one.
+/// \return the last of \p times, which ascend, at or before \p time, or the first. There must be
+/// one.
 inline auto FindAtOrBefore(const std::vector<FilmTime>& times, FilmTime time) {
   const auto after = std::upper_bound(times.begin(), times.end(), time);
   return after == times.begin() ? after : after - 1;

@@ -59,15 +59,16 @@ int Landing::TryContainer(FilmTime time, std::optional<Landed>* landed) {
   return PLAYER_ERROR_NONE;
 }
 
-/// A demuxer goes to the first key frame of a cluster, though the container lists all of them. Leaves
-/// \p landed empty when there is none where the list says so.
+/// A demuxer goes to the first key frame of a cluster, though the container lists all of them.
+/// Leaves \p landed empty when there is none where the list says so.
 int Landing::CorrectByList(FilmTime time, std::optional<Landed>* landed) {
   const auto& listed = film_.GetListed();
   const auto shown = pipeline_.GetShown();
   if (!*landed || !shown || listed.empty()) return PLAYER_ERROR_NONE;
   const FilmTime shift = static_cast<FilmTime>(shown->stamp) - shown->time;
   FilmTime limit = time;
-  // Listed times are whole milliseconds: the key frame may be a little later, and then after the time.
+  // Listed times are whole milliseconds: the key frame may be a little later, and then after the
+  // time.
   for (int i = 0; i < 2; ++i) {
     const FilmTime keyFrame = *FindAtOrBefore(listed, limit + shift) - shift;
     if (*landed && Around(keyFrame).Holds((*landed)->time)) break;

@@ -9,8 +9,8 @@
 
 namespace Desktop {
 
-/// Requests that a caller sends in one go, and the server's answers to them. Lives and dies under the
-/// connection's lock; requests that aren't answered by then are forgotten.
+/// Requests that a caller sends in one go, and the server's answers to them. Lives and dies under
+/// the connection's lock; requests that aren't answered by then are forgotten.
 class Batch {
  public:
   explicit Batch(Connection& connection) : connection_(connection) {}

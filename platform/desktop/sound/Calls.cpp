@@ -11,8 +11,9 @@ namespace {
 
 constexpr pa_sample_spec kSilence = {PA_SAMPLE_S16NE, 8000, 1};
 
-/// A second of silence, refilled by quarters. What is refilled at once decides how late the sink may
-/// be: with halves the server asks it for no latency at all, and wakes up a thousand times a second.
+/// A second of silence, refilled by quarters. What is refilled at once decides how late the sink
+/// may be: with halves the server asks it for no latency at all, and wakes up a thousand times a
+/// second.
 constexpr std::uint32_t kBytesPerSecond = 16000;
 constexpr std::uint32_t kByDefault = UINT32_MAX;
 constexpr pa_buffer_attr kBuffer = {kByDefault, kBytesPerSecond, 0, kBytesPerSecond / 4,
@@ -91,8 +92,8 @@ int Calls::AwaitStream(Connection::Lock& lock, Connection::Time limit, int numbe
   return call->IsOpen() ? int{SOUND_MANAGER_ERROR_NONE} : ToErrorCode(call->error);
 }
 
-/// Ends a session. The server refuses to end a stream that it is still to make, and would keep it: its
-/// end comes with its making then.
+/// Ends a session. The server refuses to end a stream that it is still to make, and would keep it:
+/// its end comes with its making then.
 void Calls::End(int number) {
   Call* call = Find(number);
   if (call == nullptr) return;

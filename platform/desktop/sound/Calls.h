@@ -9,9 +9,9 @@
 
 namespace Desktop {
 
-/// The open call sessions. Each is a stream of silence with the role "phone", which the server and the
-/// other programs see for as long as it plays. It outlives its stream: when the server is back, the
-/// stream is opened again. Under the connection's lock.
+/// The open call sessions. Each is a stream of silence with the role "phone", which the server and
+/// the other programs see for as long as it plays. It outlives its stream: when the server is back,
+/// the stream is opened again. Under the connection's lock.
 class Calls {
  public:
   class Owner {

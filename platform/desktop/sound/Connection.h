@@ -12,12 +12,12 @@
 
 namespace Desktop {
 
-/// The connection to the sound server, which comes back by itself when the server does, and the thread
-/// that serves it. It never starts a server.
+/// The connection to the sound server, which comes back by itself when the server does, and the
+/// thread that serves it. It never starts a server.
 ///
-/// One lock guards all that this thread and its callers share; the thread holds it whenever it doesn't
-/// sleep. libpulse's own threaded loop has no wait with a bound. Never destroyed: callers come until
-/// the process is gone.
+/// One lock guards all that this thread and its callers share; the thread holds it whenever it
+/// doesn't sleep. libpulse's own threaded loop has no wait with a bound. Never destroyed: callers
+/// come until the process is gone.
 class Connection {
  public:
   using Clock = std::chrono::steady_clock;

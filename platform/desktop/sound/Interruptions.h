@@ -22,7 +22,8 @@ enum InterruptionCode : int {
   kAlarmStarted = 6,
 };
 
-/// The default sink: its mute is mute-all; losing it disrupts the session. Under the connection's lock.
+/// The default sink: its mute is mute-all; losing it disrupts the session. Under the connection's
+/// lock.
 class Output {
  public:
   /// The server's name for the sink that is the default.
@@ -70,9 +71,9 @@ class Output {
 /// The session's interruptions, which count as one: it starts with the first stream that interrupts
 /// and is finished with the last. Under the connection's lock.
 ///
-/// What seems to end is settled by another look at the streams: PipeWire tells of a stream that moves
-/// to another sink as of one that ends and one that begins, and a sink that vanishes takes its streams
-/// along, which is one event and not two.
+/// What seems to end is settled by another look at the streams: PipeWire tells of a stream that
+/// moves to another sink as of one that ends and one that begins, and a sink that vanishes takes
+/// its streams along, which is one event and not two.
 class Interruptions {
  public:
   Interruptions(const Reports& reports, const Streams& streams, const Output& output)

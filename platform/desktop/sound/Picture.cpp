@@ -75,7 +75,8 @@ void Picture::AskForOutput() {
   Ask(pa_context_get_sink_info_by_name(connection_.GetContext(), Output::kName, OnOutput, this));
 }
 
-/// What happens to a stream before its answer is sent is in the answer: one question at a time will do.
+/// What happens to a stream before its answer is sent is in the answer: one question at a time will
+/// do.
 void Picture::AskForStream(std::uint32_t index) {
   Stream* stream = streams_.Find(index);
   if (stream != nullptr && std::exchange(stream->isBeingRead, true)) return;
@@ -171,8 +172,8 @@ void Picture::OnEvent(pa_context*, pa_subscription_event_type_t event, std::uint
   }
 }
 
-/// While streams are being asked, their answers are likely to tell the same. The question makes work
-/// for the server, which somebody who drags a slider would feel.
+/// While streams are being asked, their answers are likely to tell the same. The question makes
+/// work for the server, which somebody who drags a slider would feel.
 void Picture::OnEntriesChanged(pa_context*, void* self) {
   Picture& picture = ToPicture(self);
   picture.areEntriesDue_ = true;

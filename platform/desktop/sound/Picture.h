@@ -10,9 +10,9 @@
 
 namespace Desktop {
 
-/// What the server has told: a picture of it that its events keep up to date, and from which changes
-/// are reported. Events carry no values, so each is followed by a question. Under the connection's
-/// lock; the server's events and answers are read on the connection's thread.
+/// What the server has told: a picture of it that its events keep up to date, and from which
+/// changes are reported. Events carry no values, so each is followed by a question. Under the
+/// connection's lock; the server's events and answers are read on the connection's thread.
 class Picture final : public Connection::Owner, private Calls::Owner {
  public:
   explicit Picture(Connection& connection) : connection_(connection) {}

@@ -13,11 +13,11 @@
 
 namespace Desktop {
 
-/// The categories' levels. A category's level is that of its stored volume or live stream that changed
-/// last, by anybody. Under the connection's lock.
+/// The categories' levels. A category's level is that of its stored volume or live stream that
+/// changed last, by anybody. Under the connection's lock.
 ///
-/// The server answers a connection in order. So a value that differs from the one known is a change,
-/// and what this process itself sets is known from its answer on: no change is told twice.
+/// The server answers a connection in order. So a value that differs from the one known is a
+/// change, and what this process itself sets is known from its answer on: no change is told twice.
 class Volumes {
  public:
   Volumes(const Reports& reports, Streams& streams) : reports_(reports), streams_(streams) {}

@@ -26,13 +26,13 @@ struct LogRecord {
 /// Writes a line's text, without an end of line, cut off at \p size with a zero behind it.
 void FormatLog(const LogRecord& record, char* text, std::size_t size) noexcept;
 
-/// Receives log lines, also those of level `kDebug`. Called on the thread that logs, by several threads at once. What a sink
-/// itself logs goes to standard error. It must not call `SetLogSink`.
+/// Receives log lines, also those of level `kDebug`. Called on the thread that logs, by several
+/// threads at once. What a sink itself logs goes to standard error. It must not call `SetLogSink`.
 using LogSink = void (*)(const LogRecord& record, void* context);
 
-/// Sends log lines to \p sink in place of standard error; null sends them there again, those of level
-/// `kDebug` only when the environment variable ZELKORA_LOG is "debug" at the first of them. Returns when
-/// no call of the sink before is running.
+/// Sends log lines to \p sink in place of standard error; null sends them there again, those of
+/// level `kDebug` only when the environment variable ZELKORA_LOG is "debug" at the first of them.
+/// Returns when no call of the sink before is running.
 void SetLogSink(LogSink sink, void* context) noexcept;
 
 /// What follows a reported assertion.

@@ -10,8 +10,8 @@ constexpr double kGlideSeconds = 0.02;
 constexpr double kAttackSeconds = 0.005;
 constexpr double kReleaseSeconds = 0.2;
 
-/// In dB. The dynamics lower what is louder than the unchanged level and raise what is softer; below
-/// the threshold they raise everything alike.
+/// In dB. The dynamics lower what is louder than the unchanged level and raise what is softer;
+/// below the threshold they raise everything alike.
 constexpr float kUnchanged = -15;
 constexpr float kThreshold = -30;
 

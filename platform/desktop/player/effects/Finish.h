@@ -5,9 +5,9 @@
 
 namespace Desktop {
 
-/// Stereo width, dynamics and gain, on interleaved stereo samples, in place. Changes are spread over
-/// some milliseconds, so that none is heard as a click. When it has nothing to do, the samples stay
-/// as they are, bit by bit.
+/// Stereo width, dynamics and gain, on interleaved stereo samples, in place. Changes are spread
+/// over some milliseconds, so that none is heard as a click. When it has nothing to do, the samples
+/// stay as they are, bit by bit.
 class Finish {
  public:
   /// As they are, nothing changes.

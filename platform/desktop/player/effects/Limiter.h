@@ -9,8 +9,8 @@
 
 namespace Desktop {
 
-/// Keeps stereo sound in floating point below full scale: a plug-in's limiter, which looks ahead and
-/// so delays the sound by some milliseconds. Here the delay is taken out of the time stamps and
+/// Keeps stereo sound in floating point below full scale: a plug-in's limiter, which looks ahead
+/// and so delays the sound by some milliseconds. Here the delay is taken out of the time stamps and
 /// reported as latency, the sound's end is fetched out of the plug-in, and at rest the sound that
 /// went in comes out, delayed as ever, bit by bit.
 class Limiter {

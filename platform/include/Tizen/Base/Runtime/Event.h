@@ -48,8 +48,8 @@ class _Event : public Tizen::Base::Object {
 
   /// Queues \p arg, which was made with `new` and belongs to the platform from now on: it is freed
   /// after the last delivery, or at once when this fails.
-  /// \return `E_SUCCESS`, or another code when nothing was queued: `E_OUT_OF_MEMORY`; `E_SYSTEM` when
-  /// the process is ending
+  /// \return `E_SUCCESS`, or another code when nothing was queued: `E_OUT_OF_MEMORY`; `E_SYSTEM`
+  /// when the process is ending
   result FireAsync(IEventArg& arg);
 
  protected:

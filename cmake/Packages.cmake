@@ -9,6 +9,7 @@ set(CPACK_THREADS 1)  # more compress differently each time
 set(CPACK_ARCHIVE_COMPONENT_INSTALL OFF)
 set(CPACK_DEB_COMPONENT_INSTALL ON)
 set(CPACK_DEBIAN_FILE_NAME DEB-DEFAULT)
+set(CPACK_PACKAGE_FILE_NAME "${PROJECT_NAME}-${PROJECT_VERSION}-linux-${CMAKE_SYSTEM_PROCESSOR}")
 set(CPACK_DEBIAN_PACKAGE_CONTROL_STRICT_PERMISSION ON)
 
 # The packages of this run aren't installed, so what they need of each other is named below.
@@ -38,22 +39,22 @@ macro(zelkora_package component name section depends text)
   set(CPACK_DEBIAN_${key}_PACKAGE_DEPENDS "${depends}")
 endmacro()
 
-set(device ${simulated})
+set(devices ${simulated})
 set(CPACK_COMPONENTS_ALL "")
 if(ZELKORA_DESKTOP)
-  set(device ${desktop})
+  string(APPEND devices ", ${desktop}")
   zelkora_package(desktop zelkora-media-desktop sound "${simulated}"
     "media extensions: the desktop device\nA player on GStreamer and a sound manager on PulseAudio or PipeWire.")
   set(CPACK_DEBIAN_DESKTOP_PACKAGE_RECOMMENDS
     "pulseaudio | pipewire-pulse, gstreamer1.0-plugins-base, gstreamer1.0-plugins-good, gstreamer1.0-plugins-bad, gstreamer1.0-libav, swh-plugins")
 endif()
 if(ZELKORA_TOOLS)
-  zelkora_package(tools zelkora-media-tools sound "${runtime} ${same}, ${device}"
+  zelkora_package(tools zelkora-media-tools sound "${runtime} ${same}, ${devices}"
     "media extensions: the command-line program\nThe program zelkora, and zelkora-on, which runs any program on a device.")
 endif()
 zelkora_package(runtime ${runtime} libs "${system}zelkora-media-desktop | zelkora-media-simulated"
   "media extensions: the library\nEffects, sessions, volumes, calls and key-frame seek for native applications.")
-zelkora_package(development libzelkora-media-dev libdevel "${runtime} ${same}, ${simulated}, ${device}"
+zelkora_package(development libzelkora-media-dev libdevel "${runtime} ${same}, ${devices}"
   "media extensions: headers, and what CMake and pkg-config need\nFor programs that use the library, and for their tests.")
 zelkora_package(simulated zelkora-media-simulated libs "${system}"
   "media extensions: the simulated device\nIn memory and steered by a test, together with the application framework of all devices.")

@@ -66,7 +66,7 @@ Page ReadPage() {
   std::map<int, result>* numbers = nullptr;
   std::istringstream lines(Read("docs/errors.md"));
   for (std::string line; std::getline(lines, line);) {
-    if (line.rfind("## ", 0) == 0) classes = Quoted(line);
+    if (line.rfind("## ", 0) == 0) classes = FindAll(line, "([A-Za-z]+)");
     if (line.rfind("| Sound manager's", 0) == 0) numbers = &page.soundManagerNumbers;
     if (line.rfind("| Player's", 0) == 0) numbers = &page.playerNumbers;
     const Lines cells = FindAll(line + " ", "\\| (.*?) (?=\\| )");

@@ -114,7 +114,7 @@ class ZELKORA_MEDIA_API AudioEffector : public Tizen::Base::Object {
   /// - the player's refusal
   Tizen::Base::Collection::IListT<AudioEffectType>* GetSupportedEffectListN() const;
 
-  /// The same for presets.
+  /// Lists the presets that the player supports, like the effects.
   Tizen::Base::Collection::IListT<AudioEffectPreset>* GetSupportedEffectPresetListN() const;
 
   /// Sets an effect's level.

@@ -8,6 +8,7 @@
 
 #include <string_view>
 
+/// What a program may ask and tell the application framework, on any device.
 namespace Host {
 
 /// The features known to the platform, by the last element of their keys' paths.

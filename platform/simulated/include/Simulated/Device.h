@@ -13,6 +13,7 @@
 #include <array>
 #include <vector>
 
+/// What a test tells the simulated device.
 namespace Simulated {
 
 using Host::WaitUntilDelivered;

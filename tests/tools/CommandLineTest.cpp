@@ -282,7 +282,8 @@ TEST_F(CommandLine, DoctorTellsWhatIsMissingAndWhatMendsIt) {
 #ifdef WITH_DESKTOP
   Expect("PULSE_SERVER=unix:none $D doctor", 1,
          AllOf(HasSubstr("ok       video: H.264\n"),
-               HasSubstr("missing  sound server\n         mend it: pulseaudio --start\n")));
+               HasSubstr("missing  sound server\n"
+                         "         mend it: apt install pulseaudio; pulseaudio --start\n")));
 #endif
 }
 

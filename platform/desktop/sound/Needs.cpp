@@ -91,7 +91,8 @@ class Server {
 
 std::vector<Need> ListSoundManagerNeeds() {
   Server server;
-  std::vector<Need> needs{{"sound server", server.Ask(), "pulseaudio --start"}};
+  std::vector<Need> needs{
+      {"sound server", server.Ask(), "apt install pulseaudio; pulseaudio --start"}};
   if (!needs.front().isMet) return needs;
   needs.push_back({"sound output", server.HasSink(), "pactl load-module module-null-sink"});
   if (server.IsPipeWire()) return needs;  // which keeps volumes, and pauses others, by itself

@@ -30,7 +30,7 @@ Recording::Recording(const std::string& file, const std::string& mode) : file_(f
 void Recording::Add(const std::string& event) {
   using std::chrono::milliseconds;
   const Clock::time_point now = Clock::now();
-  const long waited = std::chrono::duration_cast<milliseconds>(now - last_).count();
+  const auto waited = std::chrono::duration_cast<milliseconds>(now - last_).count();
   last_ = now;
   if (waited >= kShortestWait) Write(fmt::format("wait {}", waited));
   Write(ToCommand(event));

@@ -22,9 +22,8 @@ class Bytes {
   /// A stream that is sent elsewhere forgets what it has read ahead, so a short way is read.
   void GoTo(std::uint64_t place) {
     constexpr std::uint64_t kShort = 4096;
-    const auto way = static_cast<std::streamoff>(place - place_);
     if (place > place_ && place - place_ < kShort) {
-      file_.ignore(way);
+      file_.ignore(static_cast<std::streamsize>(place - place_));
     } else if (place != place_) {
       file_.seekg(static_cast<std::streamoff>(place));
     }

@@ -15,7 +15,7 @@ bool IsPlugged(const pa_sink_info& info, const std::string& port) {
 
 }  // namespace
 
-void Output::Put(const pa_sink_info& info) {
+void DefaultSink::Put(const pa_sink_info& info) {
   const bool isSuspended = info.state == PA_SINK_SUSPENDED;
   if (Is(info.index)) {
     if (WasUnplugged(info)) reports_.ReportInterruption(kOutputGone);
@@ -31,22 +31,22 @@ void Output::Put(const pa_sink_info& info) {
 
 /// \return whether what was heard until now has just been unplugged; the server goes on to another
 /// port by itself, before or after it tells
-bool Output::WasUnplugged(const pa_sink_info& info) const {
+bool DefaultSink::WasUnplugged(const pa_sink_info& info) const {
   return sink_->isPlugged && !IsPlugged(info, sink_->port);
 }
 
-void Output::OnRemoved() {
+void DefaultSink::OnRemoved() {
   removed_ = sink_->index;
   sink_.reset();
   reports_.ReportInterruption(kOutputGone);
 }
 
-void Output::OnServerLost() {
+void DefaultSink::OnServerLost() {
   sink_.reset();
   removed_.reset();
 }
 
-void Output::OnMuted(bool isMuted) {
+void DefaultSink::OnMuted(bool isMuted) {
   const bool changed = isMuted_ && *isMuted_ != isMuted;
   isMuted_ = isMuted;
   if (changed) reports_.ReportMuteAll(isMuted);
@@ -64,7 +64,7 @@ bool Interruptions::Update() {
 
 void Interruptions::Settle() {
   for (const auto& [stream, sink] : std::exchange(killed_, {})) {
-    if (streams_.Has(stream) || output_.WasRemoved(sink)) continue;
+    if (streams_.Has(stream) || defaultSink_.WasRemoved(sink)) continue;
     reports_.ReportInterruption(kTakenOver);
   }
   if (!Update()) return;

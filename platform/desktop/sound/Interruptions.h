@@ -24,12 +24,13 @@ enum InterruptionCode : int {
 
 /// The default sink: its mute is mute-all; losing it disrupts the session. Under the connection's
 /// lock.
-class Output {
+class DefaultSink {
  public:
   /// The server's name for the sink that is the default.
   static constexpr char kName[] = "@DEFAULT_SINK@";
 
-  Output(const Reports& reports, const Streams& streams) : reports_(reports), streams_(streams) {}
+  DefaultSink(const Reports& reports, const Streams& streams)
+      : reports_(reports), streams_(streams) {}
 
   bool Exists() const { return sink_.has_value(); }
   bool Is(std::uint32_t sink) const { return sink_ && sink_->index == sink; }
@@ -76,8 +77,8 @@ class Output {
 /// its streams along, which is one event and not two.
 class Interruptions {
  public:
-  Interruptions(const Reports& reports, const Streams& streams, const Output& output)
-      : reports_(reports), streams_(streams), output_(output) {}
+  Interruptions(const Reports& reports, const Streams& streams, const DefaultSink& defaultSink)
+      : reports_(reports), streams_(streams), defaultSink_(defaultSink) {}
 
   /// Compares with the streams that are there now. \return whether something seems to have ended
   bool Update();
@@ -102,7 +103,7 @@ class Interruptions {
 
   const Reports& reports_;
   const Streams& streams_;
-  const Output& output_;
+  const DefaultSink& defaultSink_;
   int started_ = kFinished;  // the code it started with
   std::vector<Killed> killed_;
 };

@@ -47,7 +47,7 @@ void Picture::OnConnected(pa_context* context) {
   volumes_.Begin();
   Forget(pa_context_subscribe(context, kWatched, nullptr, nullptr));
   AskForServer();
-  AskForOutput();
+  AskForDefaultSink();
   WatchEntries();
   AskForStreams();
   calls_.OpenStreams();
@@ -57,7 +57,7 @@ void Picture::OnDisconnected(bool isLost) {
   isComplete_ = areEntriesDue_ = areStreamsRead_ = false;
   answered_ = asked_;  // what is on the way won't be answered
   streams_.Clear();
-  output_.OnServerLost();
+  defaultSink_.OnServerLost();
   calls_.DropStreams();
   if (isLost) interruptions_.OnServerLost();
 }
@@ -71,8 +71,9 @@ void Picture::AskForServer() {
   Ask(pa_context_get_server_info(connection_.GetContext(), OnServer, this));
 }
 
-void Picture::AskForOutput() {
-  Ask(pa_context_get_sink_info_by_name(connection_.GetContext(), Output::kName, OnOutput, this));
+void Picture::AskForDefaultSink() {
+  Ask(pa_context_get_sink_info_by_name(connection_.GetContext(), DefaultSink::kName, OnDefaultSink,
+                                       this));
 }
 
 /// What happens to a stream before its answer is sent is in the answer: one question at a time will
@@ -119,10 +120,10 @@ void Picture::OnServer(pa_context*, const pa_server_info* info, void* self) {
   picture.OnAnswered();
 }
 
-void Picture::OnOutput(pa_context*, const pa_sink_info* info, int end, void* self) {
+void Picture::OnDefaultSink(pa_context*, const pa_sink_info* info, int end, void* self) {
   Picture& picture = ToPicture(self);
-  if (info != nullptr) return picture.output_.Put(*info);
-  if (end < 0) picture.output_.Clear();
+  if (info != nullptr) return picture.defaultSink_.Put(*info);
+  if (end < 0) picture.defaultSink_.Clear();
   picture.OnAnswered();
 }
 
@@ -162,7 +163,7 @@ void Picture::OnEvent(pa_context*, pa_subscription_event_type_t event, std::uint
   const int type = event & PA_SUBSCRIPTION_EVENT_TYPE_MASK;
   Picture& picture = ToPicture(self);
   switch (event & PA_SUBSCRIPTION_EVENT_FACILITY_MASK) {
-    case PA_SUBSCRIPTION_EVENT_SERVER: return picture.AskForOutput();
+    case PA_SUBSCRIPTION_EVENT_SERVER: return picture.AskForDefaultSink();
     case PA_SUBSCRIPTION_EVENT_SINK: return picture.OnSinkEvent(type, index);
     case PA_SUBSCRIPTION_EVENT_SINK_INPUT:
       if (type == PA_SUBSCRIPTION_EVENT_REMOVE) return picture.OnStreamRemoved(index);
@@ -182,9 +183,9 @@ void Picture::OnEntriesChanged(pa_context*, void* self) {
 
 void Picture::OnSinkEvent(int type, std::uint32_t index) {
   if (type == PA_SUBSCRIPTION_EVENT_NEW) return calls_.OpenStreams();  // those that had no sink
-  if (!output_.Is(index)) return;
-  if (type == PA_SUBSCRIPTION_EVENT_REMOVE) output_.OnRemoved();
-  AskForOutput();
+  if (!defaultSink_.Is(index)) return;
+  if (type == PA_SUBSCRIPTION_EVENT_REMOVE) defaultSink_.OnRemoved();
+  AskForDefaultSink();
 }
 
 /// A player corks its stream before it closes it, of which an answer that is on its way would tell.

@@ -21,7 +21,7 @@ class Picture final : public Connection::Owner, private Calls::Owner {
   /// @{
   Reports& GetReports() { return reports_; }
   Volumes& GetVolumes() { return volumes_; }
-  Output& GetOutput() { return output_; }
+  DefaultSink& GetDefaultSink() { return defaultSink_; }
   Interruptions& GetInterruptions() { return interruptions_; }
   Calls& GetCalls() { return calls_; }
   bool IsOfPipeWire() const { return isPipeWire_; }
@@ -46,7 +46,7 @@ class Picture final : public Connection::Owner, private Calls::Owner {
   /// @{
   void Ask(pa_operation* operation);
   void AskForServer();
-  void AskForOutput();
+  void AskForDefaultSink();
   void AskForStream(std::uint32_t index);
   void AskForStreams();
   void AskForEntries();
@@ -57,7 +57,7 @@ class Picture final : public Connection::Owner, private Calls::Owner {
   /// \name The server's answers
   /// @{
   static void OnServer(pa_context* context, const pa_server_info* info, void* self);
-  static void OnOutput(pa_context* context, const pa_sink_info* info, int end, void* self);
+  static void OnDefaultSink(pa_context* context, const pa_sink_info* info, int end, void* self);
   static void OnStream(pa_context* context, const pa_sink_input_info* info, int end, void* self);
   static void OnStreams(pa_context* context, const pa_sink_input_info* info, int end, void* self);
   static void OnEntry(pa_context* context, const pa_ext_stream_restore_info* info, int end,
@@ -80,8 +80,8 @@ class Picture final : public Connection::Owner, private Calls::Owner {
   Reports reports_;
   Streams streams_;
   Volumes volumes_{reports_, streams_};
-  Output output_{reports_, streams_};
-  Interruptions interruptions_{reports_, streams_, output_};
+  DefaultSink defaultSink_{reports_, streams_};
+  Interruptions interruptions_{reports_, streams_, defaultSink_};
   Calls calls_{connection_, *this};
   bool isPipeWire_ = false;
   bool isComplete_ = false;      // all of the server has been seen since it was connected

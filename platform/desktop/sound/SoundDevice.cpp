@@ -120,9 +120,9 @@ int SoundDevice::SetLevel(int type, int level) {
 int SoundDevice::GetMuteAll(bool& muted) {
   return OnDevice([&](Device& device, Lock& lock, Time limit) -> int {
     if (const int error = device.picture.Refresh(lock, limit)) return error;
-    const Desktop::Output& output = device.picture.GetOutput();
-    if (!output.Exists()) return SOUND_MANAGER_ERROR_INVALID_OPERATION;
-    muted = output.IsMuted();
+    const Desktop::DefaultSink& defaultSink = device.picture.GetDefaultSink();
+    if (!defaultSink.Exists()) return SOUND_MANAGER_ERROR_INVALID_OPERATION;
+    muted = defaultSink.IsMuted();
     return SOUND_MANAGER_ERROR_NONE;
   });
 }
@@ -130,18 +130,19 @@ int SoundDevice::GetMuteAll(bool& muted) {
 int SoundDevice::SetMuteAll(bool muted) {
   return OnDevice([=](Device& device, Lock& lock, Time limit) -> int {
     Picture& picture = device.picture;
-    Desktop::Output& output = picture.GetOutput();
+    Desktop::DefaultSink& defaultSink = picture.GetDefaultSink();
     const auto refresh = [&] { return picture.Refresh(lock, limit); };
     // What another program changed before is reported before.
     if (const int error = refresh()) return error;
     Batch batch(device.connection);
     batch.Add([&](pa_context_success_cb_t onAnswer, void* data) {
       return pa_context_set_sink_mute_by_name(device.connection.GetContext(),
-                                              Desktop::Output::kName, muted, onAnswer, data);
+                                              Desktop::DefaultSink::kName, muted, onAnswer, data);
     });
-    if (!picture.IsOfPipeWire()) batch.WhenDone([&] { output.OnMuted(muted); });
+    if (!picture.IsOfPipeWire()) batch.WhenDone([&] { defaultSink.OnMuted(muted); });
     if (const int error = batch.Await(lock, limit)) return error;
-    return AwaitReadBack(device, lock, limit, refresh, [&] { return output.IsMuted() == muted; });
+    return AwaitReadBack(device, lock, limit, refresh,
+                         [&] { return defaultSink.IsMuted() == muted; });
   });
 }
 

@@ -16,7 +16,7 @@ constexpr int kYes = PA_PORT_AVAILABLE_YES;
 constexpr int kUnknown = PA_PORT_AVAILABLE_UNKNOWN;
 
 /// Tells of a sink with headphones and a speaker.
-void Tell(Output& output, int headphones, bool isSpeakerActive) {
+void Tell(DefaultSink& defaultSink, int headphones, bool isSpeakerActive) {
   pa_sink_port_info ports[2] = {};
   ports[0].name = "headphones";
   ports[0].available = headphones;
@@ -28,7 +28,7 @@ void Tell(Output& output, int headphones, bool isSpeakerActive) {
   sink.n_ports = 2;
   sink.ports = list;
   sink.active_port = list[isSpeakerActive ? 1 : 0];
-  output.Put(sink);
+  defaultSink.Put(sink);
 }
 
 TEST(Headphones, DisruptWhenTheyAreUnpluggedAndOnlyThen) {
@@ -50,14 +50,14 @@ TEST(Headphones, DisruptWhenTheyAreUnpluggedAndOnlyThen) {
   for (const auto& row : rows) {
     std::vector<int> codes;
     const Streams streams;
-    Output output(reports, streams);
+    DefaultSink defaultSink(reports, streams);
     const sound_manager_session_interrupted_cb callback = [](int code, void* data) {
       static_cast<std::vector<int>*>(data)->push_back(code);
     };
     Native::SetCallback(Native::Kind::kInterruption, reinterpret_cast<Native::Callback>(callback),
                         &codes);
-    Tell(output, row.before, false);
-    for (int i = 0; i < 2; ++i) Tell(output, row.after, row.goesToSpeaker);
+    Tell(defaultSink, row.before, false);
+    for (int i = 0; i < 2; ++i) Tell(defaultSink, row.after, row.goesToSpeaker);
     Native::WaitUntilReported();
     EXPECT_EQ(codes, row.disrupts ? std::vector<int>{3} : std::vector<int>{}) << row.name;
     Native::UnsetCallback(Native::Kind::kInterruption);

@@ -1,6 +1,6 @@
 // The native player: what doesn't depend on the device.
 
-#include "Guard.h"
+#include "Contain.h"
 #include "PlayerDevice.h"
 #include "PlayerError.h"
 
@@ -38,7 +38,7 @@ bool IsUsable(player_h player) { return player != nullptr && player->process == 
 /// Runs \p operation unless the call is to fail or its arguments are wrong.
 template <typename Operation>
 int Run(std::optional<int> failure, bool isValid, Operation operation) noexcept {
-  return Native::Guard(failure, isValid, operation, [](int code, const char* reason) {
+  return Native::Contain(failure, isValid, operation, [](int code, const char* reason) {
     return PlayerFailure(code, __LINE__, "%s", reason);
   });
 }

@@ -1,7 +1,7 @@
 // The native sound manager: what doesn't depend on the device.
 
 #include "Callbacks.h"
-#include "Guard.h"
+#include "Contain.h"
 #include "SoundDevice.h"
 #include "appfw/Global.h"
 
@@ -12,7 +12,7 @@
 #include <cstdint>
 #include <optional>
 
-using Native::Guard;
+using Native::Contain;
 using Native::Kind;
 
 namespace {
@@ -28,7 +28,7 @@ bool IsIn(int count, int value) { return value >= 0 && value < count; }
 
 template <typename Function>
 int SetCallback(std::optional<int> failure, Kind kind, Function callback, void* userData) {
-  return Guard(failure, callback != nullptr, [&] {
+  return Contain(failure, callback != nullptr, [&] {
     Host::SetDeviceWait([] {
       SoundDevice::AwaitReports();
       Native::WaitUntilReported();
@@ -40,7 +40,7 @@ int SetCallback(std::optional<int> failure, Kind kind, Function callback, void* 
 }
 
 int UnsetCallback(std::optional<int> failure, Kind kind) {
-  return Guard(failure, true, [&] {
+  return Contain(failure, true, [&] {
     Native::UnsetCallback(kind);
     SoundDevice::OnListening(kind, false);
     return kOk;
@@ -50,7 +50,7 @@ int UnsetCallback(std::optional<int> failure, Kind kind) {
 /// Changes the session by \p change.
 template <typename Change>
 int ChangeSession(std::optional<int> failure, bool isValid, Change change) {
-  return Guard(failure, isValid, [&] {
+  return Contain(failure, isValid, [&] {
     Host::Global<Native::Session>::Use(change);
     SoundDevice::OnSessionChanged();
     return kOk;
@@ -90,32 +90,32 @@ void SetSession(const Session& changed) {
 extern "C" {
 
 int sound_manager_get_max_volume(int type, int* max) {
-  return Guard(Host::OnCall(__func__, "%d", type), IsIn(kSoundTypes, type) && max != nullptr,
-               [=] { return SoundDevice::GetMaxLevel(type, *max); });
+  return Contain(Host::OnCall(__func__, "%d", type), IsIn(kSoundTypes, type) && max != nullptr,
+                 [=] { return SoundDevice::GetMaxLevel(type, *max); });
 }
 
 int sound_manager_set_volume(int type, int volume) {
-  return Guard(Host::OnCall(__func__, "%d, %d", type, volume),
-               IsIn(kSoundTypes, type) && volume >= 0, [=] {
-                 int max = 0;
-                 if (const int error = SoundDevice::GetMaxLevel(type, max)) return error;
-                 return volume <= max ? SoundDevice::SetLevel(type, volume) : Native::kRefused;
-               });
+  return Contain(Host::OnCall(__func__, "%d, %d", type, volume),
+                 IsIn(kSoundTypes, type) && volume >= 0, [=] {
+                   int max = 0;
+                   if (const int error = SoundDevice::GetMaxLevel(type, max)) return error;
+                   return volume <= max ? SoundDevice::SetLevel(type, volume) : Native::kRefused;
+                 });
 }
 
 int sound_manager_get_volume(int type, int* volume) {
-  return Guard(Host::OnCall(__func__, "%d", type), IsIn(kSoundTypes, type) && volume != nullptr,
-               [=] { return SoundDevice::GetLevel(type, *volume); });
+  return Contain(Host::OnCall(__func__, "%d", type), IsIn(kSoundTypes, type) && volume != nullptr,
+                 [=] { return SoundDevice::GetLevel(type, *volume); });
 }
 
 int sound_manager_set_muteall(bool muteall) {
-  return Guard(Host::OnCall(__func__, "%s", muteall ? "true" : "false"), true,
-               [=] { return SoundDevice::SetMuteAll(muteall); });
+  return Contain(Host::OnCall(__func__, "%s", muteall ? "true" : "false"), true,
+                 [=] { return SoundDevice::SetMuteAll(muteall); });
 }
 
 int sound_manager_get_muteall(bool* muteall) {
-  return Guard(Host::OnCall(__func__, "%s", ""), muteall != nullptr,
-               [=] { return SoundDevice::GetMuteAll(*muteall); });
+  return Contain(Host::OnCall(__func__, "%s", ""), muteall != nullptr,
+                 [=] { return SoundDevice::GetMuteAll(*muteall); });
 }
 
 int sound_manager_set_volume_changed_cb(sound_manager_volume_changed_cb callback, void* user_data) {
@@ -141,8 +141,8 @@ int sound_manager_set_session_type(int type) {
 }
 
 int sound_manager_get_session_type(int* type) {
-  return Guard(Host::OnCall(__func__, "%s", ""), type != nullptr,
-               [=] { return *type = Native::GetSession().type, kOk; });
+  return Contain(Host::OnCall(__func__, "%s", ""), type != nullptr,
+                 [=] { return *type = Native::GetSession().type, kOk; });
 }
 
 int sound_manager_set_media_session_option(int first, int second) {
@@ -154,7 +154,7 @@ int sound_manager_set_media_session_option(int first, int second) {
 }
 
 int sound_manager_get_media_session_option(int* first, int* second) {
-  return Guard(Host::OnCall(__func__, "%s", ""), first != nullptr && second != nullptr, [=] {
+  return Contain(Host::OnCall(__func__, "%s", ""), first != nullptr && second != nullptr, [=] {
     const Native::Session now = Native::GetSession();
     *first = now.options[0];
     *second = now.options[1];
@@ -172,26 +172,26 @@ int sound_manager_unset_session_interrupted_cb(void) {
 }
 
 int sound_manager_call_session_create(int type, sound_call_session_h* session) {
-  return Guard(Host::OnCall(__func__, "%d", type), type == kVoipCall && session != nullptr,
-               [=] { return OpenCall(*session); });
+  return Contain(Host::OnCall(__func__, "%d", type), type == kVoipCall && session != nullptr,
+                 [=] { return OpenCall(*session); });
 }
 
 int sound_manager_call_session_destroy(sound_call_session_h session) {
   const int number = NumberOf(session);
-  return Guard(Host::OnCall(__func__, "%d", number), true,
-               [=] { return SoundDevice::CloseCall(number); });
+  return Contain(Host::OnCall(__func__, "%d", number), true,
+                 [=] { return SoundDevice::CloseCall(number); });
 }
 
 int sound_manager_call_session_set_mode(sound_call_session_h session, int mode) {
   const int number = NumberOf(session);
-  return Guard(Host::OnCall(__func__, "%d, %d", number, mode), IsIn(kCallModes, mode),
-               [=] { return SoundDevice::SetCallMode(number, mode); });
+  return Contain(Host::OnCall(__func__, "%d, %d", number, mode), IsIn(kCallModes, mode),
+                 [=] { return SoundDevice::SetCallMode(number, mode); });
 }
 
 int sound_manager_call_session_get_mode(sound_call_session_h session, int* mode) {
   const int number = NumberOf(session);
-  return Guard(Host::OnCall(__func__, "%d", number), mode != nullptr,
-               [=] { return SoundDevice::GetCallMode(number, *mode); });
+  return Contain(Host::OnCall(__func__, "%d", number), mode != nullptr,
+                 [=] { return SoundDevice::GetCallMode(number, *mode); });
 }
 
 }  // extern "C"

@@ -21,8 +21,8 @@ inline int ReturnCode(int code, const char*) { return code; }
 /// comes out of one: it becomes a code.
 /// \param fail gives back the code that it is handed, with a reason
 template <typename Operation, typename Fail = int (*)(int, const char*)>
-int Guard(std::optional<int> failure, bool isValid, Operation operation,
-          Fail fail = ReturnCode) noexcept try {
+int Contain(std::optional<int> failure, bool isValid, Operation operation,
+            Fail fail = ReturnCode) noexcept try {
   if (failure) return *failure;
   return isValid ? operation() : fail(kRefused, "an argument is wrong");
 } catch (const std::bad_alloc&) {

@@ -36,18 +36,16 @@ struct Others {
   const Player& Play(const std::string& role) {
     const auto found = players.find(role);
     if (found != players.end()) return found->second;
-    const Player& player = players.emplace(role, Player({"media.role=" + role})).first->second;
+    const Player& player =
+        players.emplace(role, Player({"media.role=" + role, "test.role=" + role})).first->second;
     Host::WaitUntilDelivered();
     return player;
   }
 
   /// Returns when the server knows that it has ended.
   void End(const std::string& role) {
-    const auto found = players.find(role);
-    if (found == players.end()) return;
-    const std::string line = "\n" + std::to_string(found->second.GetIndex()) + "\t";
-    players.erase(found);
-    while (("\n" + Pactl({"list", "short", "sink-inputs"})).find(line) != std::string::npos) {
+    if (players.erase(role) == 0) return;
+    while (!ListStreams("test.role = \"" + role + "\"").empty()) {
     }
   }
 
@@ -103,13 +101,9 @@ void TakeOutput() {
 
 std::vector<int> GetCallModes() {
   std::vector<int> modes;
-  for (const ListedStream& stream : ListStreams("media.role = \"phone\"")) {
-    for (int mode = 0; mode < 3; ++mode) {
-      const auto shows = [&](const std::string& property) {
-        return stream.description.find(property + kModes[mode] + "\"") != std::string::npos;
-      };
-      if (shows("call.mode = \"") && shows("media.name = \"zelkora call: ")) modes.push_back(mode);
-    }
+  for (int mode = 0; mode < 3; ++mode) {
+    const auto streams = ListStreams(std::string("call.mode = \"") + kModes[mode] + "\"");
+    modes.insert(modes.end(), streams.size(), mode);
   }
   return modes;
 }

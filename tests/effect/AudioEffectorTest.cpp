@@ -114,13 +114,20 @@ TEST_F(EffectorTest, KnownValuesAloneReachThePlayerUnderItsNumbers) {
       expect(value, E_SUCCESS, {function + "(" + number + set + ")"}, answer(value));
     }
   }
-  effect = AUDIO_EFFECT_TREBLE;
-  level = INT_MIN;  // the player judges levels
-  EXPECT_EQ(kOperations.at("AudioEffector::SetEffectLevel")().Result(), E_INVALID_ARG);
-  EXPECT_EQ(Host::TakeCalls(), Lines{"player_audio_effect_set_value(2, -2147483648)"});
+}
+
+TEST_F(EffectorTest, ThePlayerJudgesLevels) {
+  for (const int judged : {INT_MIN, -13, -12, 12, 13, INT_MAX}) {
+    const result expected = judged == 12 || judged == -12 ? E_SUCCESS : E_INVALID_ARG;
+    EXPECT_EQ(effector->SetEffectLevel(AUDIO_EFFECT_BASS, judged), expected) << judged;
+    EXPECT_EQ(Host::TakeCalls(),
+              Lines{"player_audio_effect_set_value(1, " + std::to_string(judged) + ")"});
+  }
 }
 
 TEST_F(EffectorTest, ResetClearsTheEffectsInOrderThenSelectsTheNeutralPreset) {
+  effector->SetEffectLevel(AUDIO_EFFECT_BASS, 12);
+  Host::TakeCalls();
   Lines steps;
   for (unsigned i = 1; i <= 5; ++i) {
     Host::FailCall("player_audio_effect_clear", -38, i);
@@ -131,6 +138,8 @@ TEST_F(EffectorTest, ResetClearsTheEffectsInOrderThenSelectsTheNeutralPreset) {
   steps.push_back("player_audio_effect_set_preset(1)");
   EXPECT_EQ(effector->ResetAllToDefault(), E_SUCCESS);
   EXPECT_EQ(Host::TakeCalls(), steps);
+  EXPECT_EQ(effector->GetEffectLevel(AUDIO_EFFECT_BASS, low), E_SUCCESS);
+  EXPECT_EQ(low, 0);
 }
 
 TEST_F(EffectorTest, ListHoldsTheKnownValuesInThePlayersOrderAndIsNullWhenThePlayerFails) {

@@ -2,7 +2,6 @@
 
 #include "support/Gate.h"
 #include "support/NativeListener.h"
-#include "support/OwnProcess.h"
 
 #include <Simulated/Device.h>
 
@@ -62,19 +61,23 @@ TEST_F(UnsettingACallback, WaitsForItsCallAndDropsWhatIsOnTheWayForItAlone) {
     for (int i = 0; i < 1000; ++i) std::this_thread::yield();  // time for who doesn't wait
     finished = true;
   });
-  Simulated::ReportVolume(4, 1);
-  gate.AwaitVisitor();
-  Simulated::ReportVolume(4, 2);
   Simulated::ReportMuteAll(true);
-  sound_manager_unset_session_interrupted_cb();  // has no call to wait for
-  std::thread opener([&] { gate.Open(); });
+  gate.AwaitVisitor();
+  Simulated::Interrupt(1);
+  Simulated::ResetSoundManager();
+  Simulated::Interrupt(2);
+  Simulated::ReportVolume(4, 1);
+  EXPECT_EQ(sound_manager_unset_volume_changed_cb(), 0);  // has no call to wait for
   EXPECT_EQ(sound_manager_unset_volume_changed_cb(), 0);
+  NativeListener next(NativeListener::kLevels);
+  Simulated::ReportVolume(4, 2);
+  std::thread opener([&] { gate.Open(); });
+  EXPECT_EQ(sound_manager_unset_muteall_changed_cb(), 0);
   EXPECT_TRUE(finished);
   opener.join();
-  EXPECT_EQ(sound_manager_unset_volume_changed_cb(), 0);
-  Simulated::Interrupt(1);
-  Simulated::ReportVolume(4, 3);
-  EXPECT_THAT(listener.TakeAll(), ElementsAre("4=1", "muted"));
+  Simulated::ReportMuteAll(false);
+  EXPECT_THAT(listener.TakeAll(), ElementsAre("muted", "code 2"));
+  EXPECT_THAT(next.TakeAll(), ElementsAre("4=2"));
 }
 
 TEST_F(UnsettingACallback, WhileReportsPourInEndsItsCalls) {
@@ -85,16 +88,6 @@ TEST_F(UnsettingACallback, WhileReportsPourInEndsItsCalls) {
   for (int i = 0; i < 300; ++i) NativeListener listener(NativeListener::kAll);
   over = true;
   source.join();
-}
-
-TEST(ProcessDeathTest, CallbackCanBeSetWhenThreadsCanBeStartedAtLast) {
-  InOwnProcess([] {
-    const auto set = [] {
-      return sound_manager_set_volume_changed_cb([](int, int, void*) {}, nullptr);
-    };
-    EXPECT_EQ(WithoutThreads(set), SOUND_MANAGER_ERROR_OUT_OF_MEMORY);
-    EXPECT_EQ(set(), 0);
-  });
 }
 
 }  // namespace

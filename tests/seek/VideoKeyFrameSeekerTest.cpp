@@ -3,6 +3,8 @@
 #include <Tizen/Media/Player.h>
 #include <Zelkora/Media/VideoKeyFrameSeeker.h>
 
+#include <climits>
+
 namespace {
 
 using Tizen::Media::Player;
@@ -35,17 +37,24 @@ TEST_F(SeekerTest, IsConstructedOnceBehindTheFeatureGateAndKeepsItsPlayer) {
   Host::SetFeature(kFeature, Host::kFeatureAbsent);
   EXPECT_EQ(seeker.Construct(other), E_UNSUPPORTED_OPERATION);
   EXPECT_EQ(Host::TakeCalls(), (Lines{kFeatureQuery, kFeatureQuery}));
+  Forget();
   EXPECT_EQ(seeker.SeekTo(5000), E_SUCCESS);
+  ExpectLeft(kUntouched, {}, {"_PlayerImpl::SeekTo(5000, false)", "player_seek(5000, false)"});
   EXPECT_EQ(player.GetPosition(), 4000);
 }
 
-TEST_F(SeekerTest, PositionAndThePlayersAnswerArePassedOnUnchanged) {
+TEST_F(SeekerTest, LandsOnTheLastKeyFrameAtOrBeforeAPositionInTheFilm) {
   EXPECT_EQ(seeker.Construct(player), E_SUCCESS);
-  for (const long position : {4999L, long{INT32_MIN}, long{INT32_MAX}, 0L}) {
-    Host::FailCall("_PlayerImpl::SeekTo", E_SUCCESS, 1);
-    Forget();
-    EXPECT_EQ(seeker.SeekTo(position), E_SUCCESS);
-    ExpectLeft(kUntouched, {}, {"_PlayerImpl::SeekTo(" + std::to_string(position) + ", false)"});
+  Simulated::SetMedia({9000, 0, {100, 2500, 9000}, true});
+  player.OpenFile("scenes");
+  for (const auto& [asked, landed] :
+       {std::pair(0L, 100L), {2499L, 100L}, {2500L, 2500L}, {9000L, 9000L}}) {
+    EXPECT_EQ(seeker.SeekTo(asked), E_SUCCESS);
+    EXPECT_EQ(player.GetPosition(), landed);
+    for (const long outside : {-1L, 9001L, LONG_MIN, LONG_MAX}) {
+      EXPECT_EQ(seeker.SeekTo(outside), E_INVALID_ARG);
+      EXPECT_EQ(player.GetPosition(), landed);
+    }
   }
 }
 

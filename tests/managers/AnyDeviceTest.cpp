@@ -51,24 +51,6 @@ TEST_F(SessionMode, IsReadFromTheSessionTypeAndOnlyThenFromTheFirstOption) {
   }
 }
 
-using Interruptions = ManagerTest<Session>;
-
-TEST_F(Interruptions, CallsAndAlarmsOfOthersStartAndFinishThemAndLosingTheOutputDisrupts) {
-  SessionListener listener;
-  EXPECT_EQ(manager.SetAudioSessionEventListener(&listener), E_SUCCESS);
-  World::BeginCall();
-  World::EndCallOrAlarm();
-  EXPECT_EQ(listener.TakeHeard(), "started finished ");
-  EXPECT_EQ(manager.SetMode(AUDIO_SESSION_MODE_ALARM), E_SUCCESS);
-  World::BeginAlarm();
-  World::EndCallOrAlarm();
-  World::TakeOutput();
-  EXPECT_EQ(listener.TakeHeard(), "started finished disrupted ");
-  EXPECT_EQ(manager.SetAudioSessionEventListener(nullptr), E_SUCCESS);
-  World::BeginCall();
-  EXPECT_EQ(listener.TakeHeard(), "");
-}
-
 using VolumeLevels = ManagerTest<Volume>;
 using VolumeEvents = ManagerTest<Volume>;
 
@@ -97,7 +79,7 @@ TEST_F(VolumeLevels, EachCategoryHasARangeAndALevelOfItsOwnWhichTheDeviceJudges)
       EXPECT_EQ(std::invoke(category.setLevel, manager, own), E_SUCCESS);
       EXPECT_EQ(Levels(manager), expected);
     }
-    World::ChangeLevel(category.soundType, own = 3);  // nothing is remembered
+    EXPECT_EQ(std::invoke(category.setLevel, manager, own = 3), E_SUCCESS);
     for (const int level : {-1, max + 1, INT_MAX, INT_MIN}) {
       EXPECT_EQ(std::invoke(category.setLevel, manager, level), E_INVALID_ARG);
     }
@@ -107,7 +89,7 @@ TEST_F(VolumeLevels, EachCategoryHasARangeAndALevelOfItsOwnWhichTheDeviceJudges)
 
 TEST_F(VolumeLevels, MutingIsTheDevicesStateAndLeavesTheLevels) {
   EXPECT_EQ(manager.GetMuteStatus(), AUDIO_MUTE_STATUS_UNMUTED);
-  World::ChangeMuteAll(true);
+  EXPECT_EQ(manager.MuteAll(), E_SUCCESS);
   for (int i = 0; i < 2; ++i) {
     EXPECT_EQ(manager.GetMuteStatus(), AUDIO_MUTE_STATUS_MUTED);
     EXPECT_EQ(manager.GetCurrentMediaVolumeLevel(), 7);
@@ -123,11 +105,10 @@ TEST_F(VolumeLevels, MutingIsTheDevicesStateAndLeavesTheLevels) {
 TEST_F(VolumeEvents, EachChangeReachesEachListenerOnceThroughItsOwnOperation) {
   Added<VolumeListener> first, second;
   for (const SoundCategory& category : kSoundCategories) {
-    World::ChangeLevel(category.soundType, 1 + category.soundType);
+    EXPECT_EQ(std::invoke(category.setLevel, manager, 1 + category.soundType), E_SUCCESS);
   }
-  World::ChangeMuteAll(true);
-  EXPECT_EQ(manager.UnmuteAll(), E_SUCCESS);
-  EXPECT_EQ(manager.UnmuteAll(), E_SUCCESS);
+  for (int i = 0; i < 2; ++i) EXPECT_EQ(manager.MuteAll(), E_SUCCESS);
+  for (int i = 0; i < 2; ++i) EXPECT_EQ(manager.UnmuteAll(), E_SUCCESS);
   EXPECT_EQ(manager.GetMuteStatus(), AUDIO_MUTE_STATUS_UNMUTED);
   for (const int level : {0, 0, 9}) EXPECT_EQ(manager.SetAlarmVolumeLevel(level), E_SUCCESS);
   const auto all = ElementsAre("System 1", "Notification 2", "Alarm 3", "Ringtone 4", "Media 5",

@@ -158,6 +158,7 @@ TEST_P(ManyChanges, AreAllDeliveredInOrderInTheMemoryOfAFewAndUnknownTypesAreLog
     if (level + 1 == kBatch) live = CountLiveAllocations();
     ASSERT_LT(CountLiveAllocations(), live + kKeptByTheDevice);
   }
+  EXPECT_EQ(manager.GetCurrentMediaVolumeLevel(), changes - 1);
   for (const Counter& listener : listeners) {
     ASSERT_EQ(listener.count, changes);
     ASSERT_TRUE(listener.inOrder);

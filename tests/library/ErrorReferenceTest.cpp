@@ -88,6 +88,7 @@ void SetFeatures(result answer) {
   for (const auto feature : Host::kFeatures) Host::SetFeature(feature, answer);
 }
 
+void Mute() { Simulated::ReportMuteAll(true), Host::WaitUntilDelivered(); }
 void Interrupt(int code) { Simulated::Interrupt(code), Host::WaitUntilDelivered(); }
 void Change(int type) { Simulated::ReportVolume(type, 3), Host::WaitUntilDelivered(); }
 std::string Name(const Row& row) { return row.className + "::" + row.operation; }
@@ -95,19 +96,20 @@ Answer Perform(const Row& row) { return kOperations.at(Name(row))(); }
 void OpenFile() { player->OpenFile("movie"); }
 
 /// The privilege that each class needs; the others are there.
-const std::map<std::string, const char*> kPrivileges = {
+std::map<std::string, std::string> privileges = {
     {Facts<Session>::kName, Facts<Session>::kPrivilege},
     {Facts<Call>::kName, Facts<Call>::kPrivilege},
     {Facts<Volume>::kName, Facts<Volume>::kPrivilege},
 };
 
+const Simulated::Effects kNoEffects{{}, {}}, kUnknownEffect{{2, 6}, {}},
+    kUnknownPreset{{}, {20, 2}};
+const Simulated::Media kSoundAlone{60000, 2000, {}, false};
+
 /// How each cause comes about, but for functions that merely refuse.
 const std::map<std::string, std::function<void(const Row&)>> kCauses = {
     {"the privilege is missing",
-     [](auto& row) {
-       const auto privilege = kPrivileges.find(row.className);
-       if (privilege != kPrivileges.end()) Host::SetPrivilege(privilege->second, E_SYSTEM);
-     }},
+     [](auto& row) { Host::SetPrivilege(privileges[row.className], E_SYSTEM); }},
     {"the device lacks the feature", [](auto&) { SetFeatures(Host::kFeatureAbsent); }},
     {"the platform doesn't know the feature", [](auto&) { SetFeatures(E_OBJ_NOT_FOUND); }},
     {"the feature can't be looked up", [](auto&) { SetFeatures(kForeign); }},
@@ -117,11 +119,7 @@ const std::map<std::string, std::function<void(const Row&)>> kCauses = {
     {"no memory for the event", [](auto&) { failing.emplace(2); }},
     {"no memory for the list", [](auto&) { failing.emplace(0); }},
     {"the creation failed at an earlier call",
-     [](const Row& row) {
-       failing.emplace(0);
-       Perform(row);
-       failing.reset();
-     }},
+     [](auto& row) { failing.emplace(0), Perform(row), failing.reset(); }},
     {"a session is open already", [](auto&) { Call::GetInstance()->EnterCallSession(); }},
     {"no session is open", [](auto&) {}},
     {"the device succeeds and gives no session",
@@ -132,36 +130,25 @@ const std::map<std::string, std::function<void(const Row&)>> kCauses = {
     {"the listener is added already", Perform},
     {"the listener isn't added", [](auto&) {}},
     {"the player was never constructed",
-     [](auto& row) {
-       if (row.operation == "Construct") player.emplace();
-     }},
+     [](auto&) { effector.emplace(), seeker.emplace(), player.emplace(); }},
     {"the player has no native handle",
      [](auto&) {
        auto& handle = Tizen::Media::_PlayerImpl::GetInstance(&*player)->__hPlayer;
        player_destroy(std::exchange(handle, nullptr));
      }},
     {"the player supports no effect and no preset",
-     [](auto&) {
-       Simulated::SetEffects({{}, {}, {}, 0});
-     }},
+     [](auto&) { Simulated::SetEffects(kNoEffects); }},
     {"it has succeeded before", Perform},
     {"`Construct` hasn't succeeded", [](auto&) { effector.emplace(), seeker.emplace(); }},
     {"the player reports an unknown effect, which is left out",
-     [](auto&) {
-       Simulated::SetEffects({{2, 6}, {}, {}, 0});
-     }},
+     [](auto&) { Simulated::SetEffects(kUnknownEffect); }},
     {"the player reports an unknown preset, which is left out",
-     [](auto&) {
-       Simulated::SetEffects({{}, {20, 2}, {}, 0});
-     }},
+     [](auto&) { Simulated::SetEffects(kUnknownPreset); }},
     {"the effect is 6", [](auto&) { effect = AudioEffectType(6); }},
     {"the preset is 20", [](auto&) { preset = AudioEffectPreset(20); }},
     {"no file is open", [](auto&) {}},
     {"the position is outside the film", [](auto&) { OpenFile(), position = -1; }},
-    {"the file has no video",
-     [](auto&) {
-       Simulated::SetMedia({60000, 2000, {}, false}), OpenFile();
-     }},
+    {"the file has no video", [](auto&) { Simulated::SetMedia(kSoundAlone), OpenFile(); }},
 };
 
 /// How each line without an operation comes about.
@@ -180,11 +167,7 @@ const std::map<std::string, std::function<void(const Row&)>> kChanges = {
     {"a change without user data",
      [](auto&) { Simulated::ReportWithoutUserData(true), Change(4); }},
     {"a change without memory for its event", [](auto&) { failing.emplace(0), Change(4); }},
-    {"a mute without user data",
-     [](auto&) {
-       Simulated::ReportWithoutUserData(true), Simulated::ReportMuteAll(true);
-       Host::WaitUntilDelivered();
-     }},
+    {"a mute without user data", [](auto&) { Simulated::ReportWithoutUserData(true), Mute(); }},
     {"a change, and `_Event::FireAsync` refuses", [](auto&) { Change(4); }},
 };
 

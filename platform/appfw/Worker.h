@@ -108,7 +108,8 @@ bool Worker<Item>::Start() {
   std::lock_guard lock(queueMutex_);
   if (isStopped_) return false;
   if (thread_.joinable()) return true;
-  // Registered before whatever deletes at exit what is delivered to, and so called after it.
+  // Exit handlers run in reverse order: those that delete what is delivered to come later, and so
+  // run first.
   if (std::atexit([] { instance_->Stop(); }) != 0) throw std::bad_alloc();
   const auto onFork = [] { instance_->isForked_ = instance_->thread_.joinable(); };
   if (pthread_atfork(nullptr, nullptr, onFork) != 0) throw std::bad_alloc();

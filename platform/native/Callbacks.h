@@ -28,7 +28,7 @@ void UnsetCallback(Kind kind);
 /// Drops the reports that are queued.
 void DropReports();
 
-/// Hands null out in place of the program's user data with what is reported from now on, or not.
+/// Whether reports made from now on carry null in place of the program's user data.
 void ReportWithoutUserData(bool on);
 
 /// Returns when the reports made before have been delivered; at once when called from a callback.

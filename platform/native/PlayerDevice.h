@@ -41,8 +41,9 @@ int CaptureFrame(Player& player, player_frame_cb callback, void* userData);
 int RenderAudio(Player& player, const char* path);
 /// @}
 
-/// \name Sound effects At any time, also during the operations above. Levels are in the range,
-/// effects and presets aren't checked.
+/// \name Sound effects
+/// Called at any time, also during the operations above. Levels are in the range, effects and
+/// presets aren't checked.
 /// @{
 struct Range {
   int min;

@@ -18,7 +18,7 @@ int GetLevel(int type, int& level);
 int SetMuteAll(bool isMuted);
 int GetMuteAll(bool& isMuted);
 
-/// The session isn't any more what it was; `Native::GetSession` tells what it is.
+/// The session has changed; `Native::GetSession` tells what it is now.
 void OnSessionChanged();
 
 /// The program listens, or has stopped to listen, to reports of a kind.

@@ -10,8 +10,8 @@ namespace Desktop {
 /// session's role; when the server is lost, the sink fails.
 ElementPtr MakeAudioSink();
 
-/// For any thread. \return whether \p object is such a sink between two streams. Whoever asks for
-/// the time then makes it post a failure that is none; a real one comes afterwards.
+/// For any thread. \return whether \p object is such a sink between two streams. Asked for the time
+/// then, the sink posts a spurious error; a real one is posted again afterwards.
 bool IsReplacingStream(GstObject* object);
 
 }  // namespace Desktop

@@ -19,7 +19,7 @@ class Bytes {
   bool AreGood() const { return file_.good(); }
   std::uint64_t GetPlace() const { return place_; }
 
-  /// A stream that is sent elsewhere forgets what it has read ahead, so a short way is read.
+  /// Seeking discards the stream's buffer, so a short distance is skipped by reading.
   void GoTo(std::uint64_t place) {
     constexpr std::uint64_t kShort = 4096;
     if (place > place_ && place - place_ < kShort) {

@@ -7,7 +7,7 @@
 namespace Desktop {
 namespace {
 
-/// A seek that waits longer feels like none.
+/// Nobody waits longer for a seek.
 constexpr std::chrono::seconds kIndexLimit{5};
 
 }  // namespace

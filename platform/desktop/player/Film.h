@@ -53,7 +53,7 @@ class Film {
   /// too long, or none is found. It isn't tried again.
   const KeyFrameIndex* FindIndex();
 
-  /// The same for as long as that takes, again if need be.
+  /// The same without a time limit, also after an attempt that was given up.
   const KeyFrameIndex* FindIndexAtAnyRate();
 
  private:

@@ -42,8 +42,8 @@ class KeyFrameGate {
   Passage GetPassage() const;
 
   /// \param shown the time stamp of a frame that was decoded soon after the last seek
-  /// \return the key frame that it is, or nothing. That decoding began at one doesn't say so: it
-  /// begins there for an exact seek too, and sometimes a key frame earlier than needed.
+  /// \return the key frame if that frame is one, else nothing. Decoding always begins with a key
+  /// frame, also for an exact seek, so that alone tells nothing of the frame shown.
   std::optional<KeyFrame> Find(GstClockTime shown) const;
 
  private:

@@ -60,7 +60,7 @@ int Landing::TryContainer(FilmTime time, std::optional<Landed>* landed) {
 }
 
 /// A demuxer goes to the first key frame of a cluster, though the container lists all of them.
-/// Leaves \p landed empty when there is none where the list says so.
+/// Leaves \p landed empty when there is no key frame at the listed time.
 int Landing::CorrectByList(FilmTime time, std::optional<Landed>* landed) {
   const auto& listed = film_.GetListed();
   const auto shown = pipeline_.GetShown();

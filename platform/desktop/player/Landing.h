@@ -18,7 +18,7 @@ struct Landed {
 
 /// Brings a pipeline to the last key frame at or before a time, or to the first one of all. Where
 /// the container can be trusted that is one seek, which decodes the key frame only; else the film's
-/// index says which it is, and the gate before the decoder that the picture is that one.
+/// index says which key frame it is, and the gate before the decoder makes sure of it.
 class Landing {
  public:
   Landing(Pipeline& pipeline, Film& film) : pipeline_(pipeline), film_(film) {}

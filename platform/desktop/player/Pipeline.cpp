@@ -11,7 +11,7 @@ namespace {
 
 using Host::PlayerFailure;
 
-/// Longer than any answer takes that still comes, on a slow device too.
+/// An answer that takes longer, even on a slow device, isn't expected any more.
 constexpr std::chrono::seconds kAnswerLimit{10};
 constexpr std::chrono::milliseconds kGlance{200};
 

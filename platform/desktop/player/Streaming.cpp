@@ -5,7 +5,7 @@ namespace {
 
 using IteratorPtr = std::unique_ptr<GstIterator, FreeWith<gst_iterator_free>>;
 
-/// Finds what isn't changed meanwhile only; a pipeline that changes is looked at once more.
+/// When the pipeline changes meanwhile, the iterator starts again.
 bool HasAny(GstIterator* iterator, GCompareFunc isOther) {
   GValue found = G_VALUE_INIT;
   const bool hasFound = gst_iterator_find_custom(iterator, isOther, &found, nullptr);

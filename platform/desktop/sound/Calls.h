@@ -41,7 +41,7 @@ class Calls {
   void DropStreams();
 
  private:
-  /// Doesn't move, because its stream refers to it.
+  /// Never moved: its stream's callbacks hold its address.
   struct Call {
     explicit Call(Calls& ownCalls) : calls(ownCalls) {}
     ~Call() { Drop(); }

@@ -45,7 +45,8 @@ class Connection {
   /// Begins to connect, unless connected or on the way to it. The lock must be held.
   void Connect();
 
-  /// Disconnects for good and ends the thread. The lock must not be held, and goes on working.
+  /// Disconnects for good and ends the thread. The caller must not hold the lock, which can still
+  /// be used afterwards.
   void Stop();
 
   /// \return the context while connected, else null
@@ -66,7 +67,7 @@ class Connection {
     return isOver() ? ToErrorCode(error_) : int{SOUND_MANAGER_ERROR_NONE};
   }
 
-  /// Waits for nothing but a moment, which lets the thread work. The lock must be held.
+  /// Gives the lock up for a moment, so that the thread can work. The lock must be held.
   void Rest(Lock& lock, std::chrono::milliseconds moment) { progress_.wait_for(lock, moment); }
 
  private:

@@ -86,7 +86,7 @@ class Interruptions {
   /// A stream of this process has been ended by somebody, as it seems.
   void OnKilled(std::uint32_t stream, std::uint32_t sink) { killed_.push_back({stream, sink}); }
 
-  /// All streams have been told once more: what still seems to have ended has.
+  /// All streams have been read again: what still seems to have ended has ended.
   void Settle();
 
   /// A disruption is the end: what ran when the server went is not reported as finished.

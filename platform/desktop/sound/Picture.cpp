@@ -188,7 +188,8 @@ void Picture::OnSinkEvent(int type, std::uint32_t index) {
   AskForDefaultSink();
 }
 
-/// A player corks its stream before it closes it, of which an answer that is on its way would tell.
+/// A player corks its stream before it closes it: while the stream is being read, its closing may
+/// not be known yet.
 void Picture::OnStreamRemoved(std::uint32_t index) {
   const Stream* stream = streams_.Find(index);
   if (stream != nullptr && stream->isPlayer && stream->IsHeard() && !stream->isBeingRead &&

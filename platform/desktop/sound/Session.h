@@ -12,7 +12,7 @@ inline constexpr char kPlayerProperty[] = "zelkora.player";
 /// valid for ever: "music" or "game" (plays along with others' media), "alarm", "notification"
 const char* GetPlayerRole();
 
-/// To be called when a player replaces its stream, which is then not taken away by anybody.
+/// To be called when a player itself ends its stream, to replace it.
 void NoteStreamReplaced();
 
 /// \return whether a player of this process has replaced its stream in the last second

@@ -104,8 +104,8 @@ int SoundDevice::SetLevel(int type, int level) {
     Picture& picture = device.picture;
     Desktop::Volumes& volumes = picture.GetVolumes();
     const auto refresh = [&] { return picture.Refresh(lock, limit); };
-    // What another program changed before is reported before, and what is stored is written as a
-    // whole.
+    // So that what another program changed before is reported first; and a stored volume can only
+    // be written with its other fields.
     if (const int error = refresh()) return error;
     if (!volumes.AreStored()) return SOUND_MANAGER_ERROR_INVALID_OPERATION;
     Batch batch(device.connection);
@@ -132,7 +132,7 @@ int SoundDevice::SetMuteAll(bool muted) {
     Picture& picture = device.picture;
     Desktop::DefaultSink& defaultSink = picture.GetDefaultSink();
     const auto refresh = [&] { return picture.Refresh(lock, limit); };
-    // What another program changed before is reported before.
+    // So that what another program changed before is reported first.
     if (const int error = refresh()) return error;
     Batch batch(device.connection);
     batch.Add([&](pa_context_success_cb_t onAnswer, void* data) {
@@ -148,7 +148,7 @@ int SoundDevice::SetMuteAll(bool muted) {
 
 void SoundDevice::OnSessionChanged() {}  // a player looks at the session with each buffer of sound
 
-/// What the callback is told are changes of what is so now, if there is a server.
+/// The callback is told of changes from the present state on, if there is a server.
 void SoundDevice::OnListening(Native::Kind kind, bool listening) {
   if (!listening) return;
   OnDevice([=](Device& device, Lock& lock, Time limit) -> int {

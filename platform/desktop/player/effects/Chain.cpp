@@ -30,7 +30,7 @@ constexpr double kHighestShelf = 1.0 / 6;
 
 /// What changes from one buffer to the next without being heard as a click.
 constexpr double kGainStep = 1;  // in dB
-/// The equalizer rests while all gains are 0 and goes on with the memory of the sound before that.
+/// While all gains are 0 the equalizer is bypassed; then its filters resume with their old state.
 constexpr double kGainStepFromRest = 0.05;
 constexpr double kReverbStep = 0.01;
 constexpr double kAtOnce = 1000;  // steps as high as this reach any value

@@ -10,7 +10,7 @@ namespace Desktop {
 /// stay as they are, bit by bit.
 class Finish {
  public:
-  /// As they are, nothing changes.
+  /// The defaults leave the sound unchanged.
   struct Parameters {
     float gain = 1;         ///< a factor
     float sideGain = 1;     ///< a factor of the difference between left and right

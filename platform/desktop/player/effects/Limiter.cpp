@@ -130,7 +130,7 @@ void Limiter::HandleEvent(GstPad* pad, GstEvent* event) {
   gst_structure_get_int(gst_caps_get_structure(format, 0), "rate", &rate_);
 }
 
-/// What comes next doesn't follow on the sound so far: its end comes out first.
+/// At a discontinuity the delayed end of the sound so far comes out first.
 void Limiter::Drain(GstPad* pad) {
   if (isBeginning_) return;
   GstBuffer* silence = gst_buffer_new_allocate(nullptr, delay_ * kFrameSize, nullptr);

@@ -152,7 +152,7 @@ gint64 Rendering::GetBytesWritten() const {
 
 int RenderAudio(const char* uri, const EffectSettings& settings, const char* path) {
   struct stat status;
-  // What isn't a plain file, as a device, would be replaced by one.
+  // A device or a pipe would be replaced by a plain file.
   if (stat(path, &status) == 0 && !S_ISREG(status.st_mode)) {
     return PlayerFailure(PLAYER_ERROR_IO, __LINE__, "\"%s\" is not a plain file", path);
   }

@@ -24,7 +24,7 @@ inline constexpr std::array<LevelRange, 5> kLevelRanges{{
     {0, 100},   // dynamics
 }};
 
-/// Every effect's: it does nothing.
+/// The level at which an effect does nothing.
 inline constexpr int kDefaultLevel = 0;
 
 inline constexpr int kNeutralPreset = 1;

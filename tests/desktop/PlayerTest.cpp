@@ -196,7 +196,7 @@ TEST_F(PlayerTest, FileTooLongToBeReadIsSoughtInAsWellAsItsContainerCanAndClosed
   using std::chrono::seconds;
   using std::chrono::steady_clock;
   const ScratchFile film("long.ts", ReadFile(Media("h264.ts")));
-  ASSERT_EQ(truncate64(film.path.c_str(), 300'000'000'000), 0);
+  ASSERT_EQ(truncate(film.path.c_str(), 300'000'000'000), 0);
   ASSERT_EQ(player.OpenFile(film.path.c_str()), E_SUCCESS);
   CaptureStderr();
   auto begin = steady_clock::now();

@@ -24,7 +24,7 @@ void RequireOutput() {
 }
 
 void ReserveStandardStreams() {
-  std::signal(SIGPIPE, SIG_IGN);
+  for (const int signal : {SIGPIPE, SIGXFSZ}) std::signal(signal, SIG_IGN);
   for (int stream = STDIN_FILENO; stream <= STDERR_FILENO; ++stream) {
     if (fcntl(stream, F_GETFD) >= 0) continue;
     // The wrong direction makes writing fail as on a closed stream.

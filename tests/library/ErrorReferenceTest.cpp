@@ -37,7 +37,8 @@ std::string Read(const std::string& path) {
 
 /// \return what \p pattern's first group matches in \p text, each time
 Lines FindAll(const std::string& text, const std::string& pattern) {
-  const std::regex regex(pattern);
+  static std::map<std::string, std::regex> known;  // making one takes long
+  const std::regex& regex = known.try_emplace(pattern, pattern).first->second;
   Lines found;
   for (std::sregex_iterator i(text.begin(), text.end(), regex), end; i != end; ++i) {
     found.push_back((*i)[1]);

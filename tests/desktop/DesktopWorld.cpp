@@ -8,24 +8,14 @@
 #include <sound_manager.h>
 
 namespace World {
-namespace {
-
-constexpr int kFirstLevel = 7;
-
-struct Running {
-  Running() { server.Start(); }
-  SoundServer server;
-};
-
-}  // namespace
-
 void Reset() {
-  static const Running running;
+  static SoundServer server;
+  [[maybe_unused]] static const bool isStarted = (server.Start(), true);
   Host::ResetCapabilities();
   Host::ClearFailures();
   Host::RecordCalls(false);
   Host::TakeCalls();
-  for (int type = 0; type < 6; ++type) EXPECT_EQ(sound_manager_set_volume(type, kFirstLevel), 0);
+  for (int type = 0; type < 6; ++type) EXPECT_EQ(sound_manager_set_volume(type, 7), 0);
   EXPECT_EQ(sound_manager_set_muteall(false), 0);
   EXPECT_EQ(sound_manager_set_session_type(0), 0);
   EXPECT_EQ(sound_manager_set_media_session_option(0, 0), 0);

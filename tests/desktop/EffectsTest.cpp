@@ -178,8 +178,6 @@ TEST_F(EffectsTest, EveryEffectAndPresetIsThereWithItsRange) {
     EXPECT_EQ(effector.GetEffectLevelRange(type, min, max), E_SUCCESS);
     EXPECT_EQ(max, highest);
     EXPECT_EQ(min, max == 12 ? -12 : 0);
-    EXPECT_EQ(effector.SetEffectLevel(type, min - 1), E_INVALID_ARG);
-    EXPECT_EQ(effector.SetEffectLevel(type, max + 1), E_INVALID_ARG);
   }
 }
 

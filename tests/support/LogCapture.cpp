@@ -2,15 +2,8 @@
 
 #include <utility>
 
-namespace {
-
-constexpr int kModule = 80;
-constexpr char kTag[] = "ZELKORA_MEDIA";
-
-}  // namespace
-
 void LogCapture::Receive(const Host::LogRecord& record, void* context) {
-  const bool library = record.module == kModule || record.tag == std::string(kTag) ||
+  const bool library = record.module == 80 || record.tag == std::string("ZELKORA_MEDIA") ||
                        record.level == Host::LogLevel::kAssertion;
   if (!library) return;
   auto& capture = *static_cast<LogCapture*>(context);
@@ -26,7 +19,7 @@ std::string LogCapture::Text(const Host::LogRecord& record) const {
   if (record.level == Host::LogLevel::kAssertion) text = "assertion";
   if (record.level == Host::LogLevel::kInfo) text += " info";
   if (record.hasResult && message.find("[" + name + "]") == message.npos) text += " " + name;
-  const bool isSigned = record.module == kModule
+  const bool isSigned = record.module == 80
                             ? function.empty()
                             : function.find("::" + operation + "(") != function.npos ||
                                   function.find("CallBack(") != function.npos;

@@ -83,7 +83,6 @@ TEST(FailingMemory, IsAListedResultOfEachOperationLeaksNothingAndEndsWithTheShor
   }
   EXPECT_EQ(failures, "");
   EXPECT_GT(sites, 40);
-  std::printf("%d sites\n", sites);
 }
 
 }  // namespace

@@ -26,9 +26,6 @@ extern "C" int __lsan_is_turned_off() { return hasLostThreads; }
 namespace Zelkora::Media {
 namespace {
 
-using testing::Contains;
-using testing::Not;
-
 #ifdef __SANITIZE_THREAD__
 constexpr int kProcesses = 10;  // each waits a second for threads that still run
 #else
@@ -96,7 +93,8 @@ TYPED_TEST(ManagerLife, IsBegunOnceByTheFirstOfManyThreadsThatPassBothGates) {
     EXPECT_EQ(TypeParam::GetInstance(), nullptr);
     managers.insert(TypeParam::GetInstance());
     EXPECT_THAT(managers, testing::ElementsAre(testing::NotNull()));
-    EXPECT_THAT(this->log.Take(), Not(Contains(testing::StartsWith("assertion"))));
+    EXPECT_THAT(this->log.Take(),
+                testing::Not(testing::Contains(testing::StartsWith("assertion"))));
   });
 }
 

@@ -2,6 +2,7 @@
 #pragma once
 
 #include "GstreamerEnd.h"
+#include "support/ReadFile.h"
 
 #include <Tizen/Base/Result.h>
 #include <Tizen/Media/Player.h>
@@ -12,8 +13,6 @@
 
 #include <chrono>
 #include <cstdlib>
-#include <fstream>
-#include <iterator>
 #include <string>
 #include <thread>
 #include <vector>
@@ -21,11 +20,6 @@
 /// \return the path of a file that make-media made.
 inline std::string Media(const std::string& name) {
   return std::string(std::getenv("ZELKORA_TEST_MEDIA")) + "/" + name;
-}
-
-inline std::string ReadFile(const std::string& path) {
-  std::ifstream file(path, std::ios::binary);
-  return {std::istreambuf_iterator<char>(file), {}};
 }
 
 inline void WriteFile(const std::string& path, const std::string& content) {

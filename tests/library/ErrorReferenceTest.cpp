@@ -3,10 +3,10 @@
 #include "support/Allocations.h"
 #include "support/Operations.h"
 #include "support/OwnProcess.h"
+#include "support/ReadFile.h"
 
 #include <Tizen/Media/PlayerImpl.h>
 
-#include <fstream>
 #include <regex>
 #include <set>
 
@@ -30,10 +30,7 @@ struct Page {
   std::map<int, result> soundManagerNumbers, playerNumbers;
 };
 
-std::string Read(const std::string& path) {
-  std::ifstream file(ZELKORA_SOURCE_DIR "/" + path);
-  return {std::istreambuf_iterator<char>(file), {}};
-}
+std::string ReadSource(const std::string& path) { return ReadFile(ZELKORA_SOURCE_DIR "/" + path); }
 
 /// \return what \p pattern's first group matches in \p text, each time
 Lines FindAll(const std::string& text, const std::string& pattern) {
@@ -65,7 +62,7 @@ Page ReadPage() {
   Page page;
   Lines classes;
   std::map<int, result>* numbers = nullptr;
-  std::istringstream lines(Read("docs/errors.md"));
+  std::istringstream lines(ReadSource("docs/errors.md"));
   for (std::string line; std::getline(lines, line);) {
     if (line.rfind("## ", 0) == 0) classes = FindAll(line, "([A-Za-z]+)");
     if (line.rfind("| Sound manager's", 0) == 0) numbers = &page.soundManagerNumbers;
@@ -98,9 +95,9 @@ void OpenFile() { player->OpenFile("movie"); }
 
 /// The privilege that each class needs; the others are there.
 std::map<std::string, std::string> privileges = {
-    {Facts<Session>::kName, Facts<Session>::kPrivilege},
-    {Facts<Call>::kName, Facts<Call>::kPrivilege},
-    {Facts<Volume>::kName, Facts<Volume>::kPrivilege},
+    {"AudioSessionManager", Facts<Session>::kPrivilege},
+    {"VoipAudioSessionManager", Facts<Call>::kPrivilege},
+    {"AudioVolumeManager", Facts<Volume>::kPrivilege},
 };
 
 const Simulated::Effects kNoEffects{{}, {}}, kUnknownEffect{{2, 6}, {}},
@@ -285,7 +282,7 @@ Lines Declared() {
   Lines declared;
   for (const std::string name : {"AudioEffector", "AudioSessionManager", "VoipAudioSessionManager",
                                  "AudioVolumeManager", "VideoKeyFrameSeeker"}) {
-    std::string header = Read("inc/Zelkora/Media/" + name + ".h");
+    std::string header = ReadSource("inc/Zelkora/Media/" + name + ".h");
     header = header.substr(header.find("\nclass ZELKORA_MEDIA_API"));
     header.resize(header.find("private:"));
     for (const std::string& operation : FindAll(header, "\n  [\\w:<>* ]* \\*?(\\w+)\\(")) {
@@ -315,7 +312,7 @@ TEST_F(ErrorReference, HasARowForEachFailureOfEachOperationOfTheHeaders) {
   const std::string functions =
       "int _Event::Initialize( int _Event::AddListener( int _Event::RemoveListener( "
       "int _PlayerImpl::SeekTo(" +
-      Read("platform/include/sound_manager.h") + Read("platform/include/player.h");
+      ReadSource("platform/include/sound_manager.h") + ReadSource("platform/include/player.h");
   for (const auto& function : FindAll(functions, "int ((_|sound|player_audio)[\\w:]+)\\(")) {
     causes.push_back("`" + function + "` refuses");
   }

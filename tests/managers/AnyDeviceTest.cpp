@@ -51,8 +51,7 @@ TEST_F(SessionMode, IsReadFromTheSessionTypeAndOnlyThenFromTheFirstOption) {
   }
 }
 
-using VolumeLevels = ManagerTest<Volume>;
-using VolumeEvents = ManagerTest<Volume>;
+using Volumes = ManagerTest<Volume>;
 
 /// \return what the manager says of all categories
 std::vector<int> Levels(const Volume& manager) {
@@ -63,7 +62,7 @@ std::vector<int> Levels(const Volume& manager) {
   return levels;
 }
 
-TEST_F(VolumeLevels, EachCategoryHasARangeAndALevelOfItsOwnWhichTheDeviceJudges) {
+TEST_F(Volumes, EachCategoryHasARangeAndALevelOfItsOwnWhichTheDeviceJudges) {
   std::vector<int> expected = Levels(manager);
   for (const SoundCategory& category : kSoundCategories) {
     SCOPED_TRACE(category.name);
@@ -87,7 +86,7 @@ TEST_F(VolumeLevels, EachCategoryHasARangeAndALevelOfItsOwnWhichTheDeviceJudges)
   }
 }
 
-TEST_F(VolumeLevels, MutingIsTheDevicesStateAndLeavesTheLevels) {
+TEST_F(Volumes, MutingIsTheDevicesStateAndLeavesTheLevels) {
   EXPECT_EQ(manager.GetMuteStatus(), AUDIO_MUTE_STATUS_UNMUTED);
   EXPECT_EQ(manager.MuteAll(), E_SUCCESS);
   for (int i = 0; i < 2; ++i) {
@@ -102,7 +101,7 @@ TEST_F(VolumeLevels, MutingIsTheDevicesStateAndLeavesTheLevels) {
   EXPECT_EQ(manager.GetCurrentMediaVolumeLevel(), 0);
 }
 
-TEST_F(VolumeEvents, EachChangeReachesEachListenerOnceThroughItsOwnOperation) {
+TEST_F(Volumes, EachChangeReachesEachListenerOnceThroughItsOwnOperation) {
   Added<VolumeListener> first, second;
   for (const SoundCategory& category : kSoundCategories) {
     EXPECT_EQ(std::invoke(category.setLevel, manager, 1 + category.soundType), E_SUCCESS);

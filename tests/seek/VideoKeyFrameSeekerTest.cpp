@@ -9,7 +9,6 @@ namespace {
 
 using Tizen::Media::Player;
 
-constexpr char kFeature[] = "zelkora_extension_2.2";
 constexpr char kFeatureQuery[] =
     "SystemInfo::GetValue(http://developer.zelkora.example/tizen/feature/zelkora_extension_2.2)";
 
@@ -34,7 +33,7 @@ TEST_F(SeekerTest, IsConstructedOnceBehindTheFeatureGateAndKeepsItsPlayer) {
   EXPECT_EQ(seeker.Construct(player), E_SUCCESS);
   ExpectLeft(E_SUCCESS, {}, {kFeatureQuery, "_PlayerImpl::GetInstance()"});
   EXPECT_EQ(seeker.Construct(other), E_INVALID_STATE);
-  Host::SetFeature(kFeature, Host::kFeatureAbsent);
+  Host::SetFeature("zelkora_extension_2.2", Host::kFeatureAbsent);
   EXPECT_EQ(seeker.Construct(other), E_UNSUPPORTED_OPERATION);
   EXPECT_EQ(Host::TakeCalls(), (Lines{kFeatureQuery, kFeatureQuery}));
   Forget();

@@ -48,21 +48,18 @@ struct Facts;
 
 template <>
 struct Facts<Session> {
-  static constexpr char kName[] = "AudioSessionManager";
   static constexpr char kPrivilege[] = "audiomanager.session";
   static void Use(Session& manager) { manager.GetMode(); }
 };
 
 template <>
 struct Facts<Call> {
-  static constexpr char kName[] = "VoipAudioSessionManager";
   static constexpr char kPrivilege[] = "audiomanager.voipsession";
   static void Use(Call& manager) { manager.GetCallSessionMode(); }
 };
 
 template <>
 struct Facts<Volume> {
-  static constexpr char kName[] = "AudioVolumeManager";
   static constexpr char kPrivilege[] = "audiomanager.volume";
   static void Use(Volume& manager) { manager.GetMuteStatus(); }
 };

@@ -59,8 +59,6 @@ struct Answer {
   std::int64_t value;
 };
 
-using NamedOperations = std::map<std::string, std::function<Answer()>>;
-
 /// \return a call of \p operation on what \p pointer and with what \p arguments hold by then
 template <typename Pointer, typename Function, typename... Arguments>
 std::function<Answer()> On(Pointer& pointer, Function operation, Arguments&... arguments) {
@@ -74,32 +72,29 @@ Answer GetInstance() {
   return instance<Manager> = Manager::GetInstance();
 }
 
-inline const NamedOperations kOperations = [] {
+inline const std::map<std::string, std::function<Answer()>> kOperations = [] {
   using Effector = AudioEffector;
   const std::string sessions = "AudioSessionManager::", calls = "VoipAudioSessionManager::",
                     volumes = "AudioVolumeManager::", effectors = "AudioEffector::";
-  auto& session = instance<Session>;
-  auto& call = instance<Call>;
-  auto& volume = instance<Volume>;
-  NamedOperations all = {
+  std::map<std::string, std::function<Answer()>> all = {
       {sessions + "GetInstance", GetInstance<Session>},
       {sessions + "SetAudioSessionEventListener",
-       On(session, &Session::SetAudioSessionEventListener, sessionListener)},
-      {sessions + "SetMode", On(session, &Session::SetMode, sessionMode)},
-      {sessions + "GetMode", On(session, &Session::GetMode)},
+       On(instance<Session>, &Session::SetAudioSessionEventListener, sessionListener)},
+      {sessions + "SetMode", On(instance<Session>, &Session::SetMode, sessionMode)},
+      {sessions + "GetMode", On(instance<Session>, &Session::GetMode)},
       {calls + "GetInstance", GetInstance<Call>},
-      {calls + "EnterCallSession", On(call, &Call::EnterCallSession)},
-      {calls + "SetCallSessionMode", On(call, &Call::SetCallSessionMode, callMode)},
-      {calls + "GetCallSessionMode", On(call, &Call::GetCallSessionMode)},
-      {calls + "ExitCallSession", On(call, &Call::ExitCallSession)},
+      {calls + "EnterCallSession", On(instance<Call>, &Call::EnterCallSession)},
+      {calls + "SetCallSessionMode", On(instance<Call>, &Call::SetCallSessionMode, callMode)},
+      {calls + "GetCallSessionMode", On(instance<Call>, &Call::GetCallSessionMode)},
+      {calls + "ExitCallSession", On(instance<Call>, &Call::ExitCallSession)},
       {volumes + "GetInstance", GetInstance<Volume>},
       {volumes + "AddAudioVolumeEventListener",
-       On(volume, &Volume::AddAudioVolumeEventListener, volumeListener)},
+       On(instance<Volume>, &Volume::AddAudioVolumeEventListener, volumeListener)},
       {volumes + "RemoveAudioVolumeEventListener",
-       On(volume, &Volume::RemoveAudioVolumeEventListener, volumeListener)},
-      {volumes + "MuteAll", On(volume, &Volume::MuteAll)},
-      {volumes + "UnmuteAll", On(volume, &Volume::UnmuteAll)},
-      {volumes + "GetMuteStatus", On(volume, &Volume::GetMuteStatus)},
+       On(instance<Volume>, &Volume::RemoveAudioVolumeEventListener, volumeListener)},
+      {volumes + "MuteAll", On(instance<Volume>, &Volume::MuteAll)},
+      {volumes + "UnmuteAll", On(instance<Volume>, &Volume::UnmuteAll)},
+      {volumes + "GetMuteStatus", On(instance<Volume>, &Volume::GetMuteStatus)},
       {effectors + "Construct", [] { return effector->Construct(*player); }},
       {effectors + "GetSupportedEffectListN", On(effector, &Effector::GetSupportedEffectListN)},
       {effectors + "GetSupportedEffectPresetListN",
@@ -114,9 +109,9 @@ inline const NamedOperations kOperations = [] {
       {"VideoKeyFrameSeeker::SeekTo", On(seeker, &VideoKeyFrameSeeker::SeekTo, position)},
   };
   for (const auto& [name, soundType, getRange, setLevel, getLevel] : kSoundCategories) {
-    all[volumes + "Get" + name + "VolumeRange"] = On(volume, getRange, low, high);
-    all[volumes + "Set" + name + "VolumeLevel"] = On(volume, setLevel, level);
-    all[volumes + "GetCurrent" + name + "VolumeLevel"] = On(volume, getLevel);
+    all[volumes + "Get" + name + "VolumeRange"] = On(instance<Volume>, getRange, low, high);
+    all[volumes + "Set" + name + "VolumeLevel"] = On(instance<Volume>, setLevel, level);
+    all[volumes + "GetCurrent" + name + "VolumeLevel"] = On(instance<Volume>, getLevel);
   }
   return all;
 }();

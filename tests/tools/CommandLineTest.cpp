@@ -2,6 +2,8 @@
 
 #include "base/Managers.h"
 #include "base/Recording.h"
+#include "base/TemporaryFolder.h"
+#include "support/ReadFile.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -12,7 +14,6 @@
 #include <algorithm>
 #include <cstdlib>
 #include <filesystem>
-#include <fstream>
 #include <iterator>
 #include <sstream>
 #include <string>
@@ -30,11 +31,6 @@ using testing::Not;
 using testing::StartsWith;
 using Text = testing::Matcher<const std::string&>;
 
-std::string Read(const fs::path& path) {
-  std::ifstream file(path, std::ios::binary);
-  return {std::istreambuf_iterator<char>(file), {}};
-}
-
 /// Each test has an empty folder of its own to run in. "$Z" runs the program on the simulated
 /// device, "$D" on the desktop one.
 class CommandLine : public testing::Test {
@@ -45,11 +41,8 @@ class CommandLine : public testing::Test {
     setenv("TSAN_OPTIONS", "ignore_noninstrumented_modules=1:suppressions=" RACES_OF_OTHERS, 0);
     setenv("Z", PROGRAM " --device simulated", 1);
     setenv("D", PROGRAM " --device desktop", 1);
-    std::string pattern = fs::temp_directory_path() / "zelkora-XXXXXX";
-    base_ = mkdtemp(pattern.data());
-    fs::create_directory(folder_ = base_ / "folder");
+    fs::create_directory(folder_);
   }
-  ~CommandLine() override { fs::remove_all(base_); }
 
   /// Expects what a command of the shell's does: exit code, output and errors.
   void Expect(const std::string& command, int code, const Text& output, const Text& errors = "") {
@@ -58,12 +51,12 @@ class CommandLine : public testing::Test {
         "cd " + folder_.string() + " && (" + command + ") >../output 2>../errors";
     const int status = std::system(redirected.c_str());
     EXPECT_EQ(WIFEXITED(status) ? WEXITSTATUS(status) : -1, code);
-    EXPECT_THAT(Read(base_ / "output"), output);
-    EXPECT_THAT(Read(base_ / "errors"), errors);
+    EXPECT_THAT(ReadFile(base_.PathOf("output")), output);
+    EXPECT_THAT(ReadFile(base_.PathOf("errors")), errors);
   }
 
-  fs::path base_;
-  fs::path folder_;
+  const ::CommandLine::TemporaryFolder base_;
+  const fs::path folder_ = base_.PathOf("folder");
 };
 
 TEST_F(CommandLine, UsageIsPrintedOnRequestAndExplainedOnStandardErrorWhenItIsWrong) {
@@ -138,7 +131,7 @@ TEST_F(CommandLine, FilmstripHasEachKeyFrameOnceOrLeavesNothing) {
          "zelkora: note: the video has only 30 key frames near the 500 positions\n"}}) {
     Expect("$Z filmstrip a.mp4 " + std::string(options), 0,
            "strip.png: " + std::string(strip) + " pixels\n", note);
-    EXPECT_THAT(Read(folder_ / "strip.png"), StartsWith("\x89PNG\r\n"));
+    EXPECT_THAT(ReadFile(folder_ / "strip.png"), StartsWith("\x89PNG\r\n"));
   }
 }
 
@@ -148,12 +141,12 @@ TEST_F(CommandLine, WhatIsReadIsNeverWrittenOver) {
        {"filmstrip a.png -o a.png", "filmstrip a.png -o soft.png", "filmstrip soft.png -o hard.png",
         "effects a.wav --render a.wav", "effects a.wav --plot hard.png"}) {
     Expect("$Z " + command, 2, "", HasSubstr(" would be written over "));
-    EXPECT_EQ(Read(folder_ / "a.png"), "mine\n");
+    EXPECT_EQ(ReadFile(folder_ / "a.png"), "mine\n");
   }
   Expect("$Z filmstrip b.mp4 -n 1 -o soft.png", 0, HasSubstr("1 frame"));
   EXPECT_TRUE(fs::is_symlink(folder_ / "soft.png"));
-  EXPECT_THAT(Read(folder_ / "a.png"), StartsWith("\x89PNG\r\n"));  // an older one is replaced
-  EXPECT_EQ(Read(folder_ / "hard.png"), "mine\n");
+  EXPECT_THAT(ReadFile(folder_ / "a.png"), StartsWith("\x89PNG\r\n"));  // an older one is replaced
+  EXPECT_EQ(ReadFile(folder_ / "hard.png"), "mine\n");
 }
 
 #ifdef WITH_DESKTOP
@@ -210,7 +203,7 @@ TEST_F(CommandLine, ShellPlaysEachScenarioAsExpected) {
     if (file.extension() != ".txt") continue;
     ++count;
     const std::string command = "$Z shell --no-wait " + file.string() + " 2>&1";
-    Expect(command, 0, Read(file.replace_extension(".expected")));
+    Expect(command, 0, ReadFile(file.replace_extension(".expected")));
   }
   EXPECT_GE(count, 3);
 }
@@ -225,7 +218,8 @@ TEST_F(CommandLine, WhatIsRecordedPlaysBackAsItWasHeard) {
   usleep(20000);
   recording.Add("volume media 9");
   recording.Complete();
-  EXPECT_THAT(Read(folder_ / "a.txt"), AllOf(HasSubstr("session alarm\n"), HasSubstr("\nwait 2")));
+  EXPECT_THAT(ReadFile(folder_ / "a.txt"),
+              AllOf(HasSubstr("session alarm\n"), HasSubstr("\nwait 2")));
   Expect("$Z shell a.txt | sed -n 's/^< //p'", 0, heard + "volume media 9\n");
 }
 
@@ -260,8 +254,8 @@ TEST_F(CommandLine, EffectsArePlottedAndLeaveNoFileWhereTheyCannotBeHeard) {
 #ifdef WITH_DESKTOP
   Expect("$D effects --set bass=6 --plot a.png", 0, HasSubstr("a.png: bass 6"));
   Expect("$D effects --preset rock --plot b.svg", 0, HasSubstr("b.svg: preset rock"));
-  EXPECT_THAT(Read(folder_ / "a.png"), StartsWith("\x89PNG\r\n"));
-  EXPECT_THAT(Read(folder_ / "b.svg"), HasSubstr("</svg>"));
+  EXPECT_THAT(ReadFile(folder_ / "a.png"), StartsWith("\x89PNG\r\n"));
+  EXPECT_THAT(ReadFile(folder_ / "b.svg"), HasSubstr("</svg>"));
 #endif
 }
 

@@ -14,6 +14,7 @@ using Host::PlayerFailure;
 /// An answer that takes longer, even on a slow device, isn't expected any more.
 constexpr std::chrono::seconds kAnswerLimit{10};
 constexpr std::chrono::milliseconds kGlance{200};
+constexpr int kIdleGlances = 5;  // fewer may come of a busy machine
 
 /// GstPlayFlags, which has no header: video as it is decoded, and audio; no subtitles, no
 /// visualisation, no volume of our own.
@@ -72,11 +73,12 @@ bool Pipeline::Preroll() {
     return false;
   }
   Answer answer = Answer::kNone;
+  int idle = 0;
   for (std::chrono::milliseconds waited{0}; waited < kAnswerLimit; waited += kGlance) {
     // A demuxer that fails as soon as it is plugged in stops, and decodebin may swallow its error.
-    const bool isStreaming = IsStreaming(playbin_.get());
+    idle = IsStreaming(playbin_.get()) ? 0 : idle + 1;
     answer = watch_->WaitForAnswer(kGlance);
-    if (answer != Answer::kNone || !isStreaming) break;
+    if (answer != Answer::kNone || idle == kIdleGlances) break;
   }
   return answer == Answer::kDone;
 }

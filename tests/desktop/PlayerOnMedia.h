@@ -34,9 +34,6 @@ struct ScratchFile {
   }
   ~ScratchFile() { unlink(path.c_str()); }
 
-  ScratchFile(const ScratchFile&) = delete;
-  ScratchFile& operator=(const ScratchFile&) = delete;
-
   const std::string path;
 };
 

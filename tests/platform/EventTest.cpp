@@ -111,8 +111,6 @@ TEST_F(EventTest, RefusedOperationSaysWhyAndDoesNothingButFreeTheArgument) {
   event.Fire(3);
   Host::WaitUntilDelivered();
   EXPECT_THAT(listener.heard, ElementsAre(3));
-  EXPECT_EQ(event.RemoveListener(listener), E_SUCCESS);
-  EXPECT_EQ(event.RemoveListener(listener), E_OBJ_NOT_FOUND);
 }
 
 TEST_F(Delivery, IsInTheOrderOfFiringOverAllEventsOnOneThreadToWhoIsThereAllTheTime) {
@@ -226,6 +224,7 @@ TEST_F(RemovingAListener, WaitsForItsOwnCallOnly) {
   gate.Open();
   Host::WaitUntilDelivered();
   EXPECT_THAT(removed.heard, IsEmpty());
+  EXPECT_THAT(next.heard, ElementsAre(1));
 }
 
 TEST_F(DestroyingAnEvent, WaitsForItsCallAndMakesNoOther) {

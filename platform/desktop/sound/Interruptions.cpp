@@ -25,6 +25,7 @@ void DefaultSink::Put(const pa_sink_info& info) {
     }
   }
   const std::string port = info.active_port != nullptr ? info.active_port->name : "";
+  last_ = info.index;
   sink_ = Sink{info.index, port, IsPlugged(info, port), isSuspended};
   OnMuted(info.mute != 0);
 }
@@ -36,13 +37,14 @@ bool DefaultSink::WasUnplugged(const pa_sink_info& info) const {
 }
 
 void DefaultSink::OnRemoved() {
-  removed_ = sink_->index;
+  removed_ = std::exchange(last_, {});
   sink_.reset();
   reports_.ReportInterruption(kOutputGone);
 }
 
 void DefaultSink::OnServerLost() {
   sink_.reset();
+  last_.reset();
   removed_.reset();
 }
 

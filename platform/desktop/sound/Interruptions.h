@@ -34,6 +34,9 @@ class DefaultSink {
 
   bool Exists() const { return sink_.has_value(); }
   bool Is(std::uint32_t sink) const { return sink_ && sink_->index == sink; }
+  /// \return whether it was the default sink when there was one; PipeWire tells first that there is
+  /// none, and then which has gone
+  bool WasLast(std::uint32_t sink) const { return !sink_ && last_ == sink; }
   bool IsMuted() const { return isMuted_.value_or(false); }
 
   /// Applies the server's description of the default sink.
@@ -42,7 +45,7 @@ class DefaultSink {
   /// There is no default sink.
   void Clear() { sink_.reset(); }
 
-  /// The default sink went away.
+  /// The default sink, or the last one, went away.
   void OnRemoved();
 
   void OnServerLost();
@@ -65,6 +68,7 @@ class DefaultSink {
   const Reports& reports_;
   const Streams& streams_;
   std::optional<Sink> sink_;
+  std::optional<std::uint32_t> last_;  // until it is told as gone
   std::optional<std::uint32_t> removed_;
   std::optional<bool> isMuted_;  // the last one known
 };

@@ -183,7 +183,7 @@ void Picture::OnEntriesChanged(pa_context*, void* self) {
 
 void Picture::OnSinkEvent(int type, std::uint32_t index) {
   if (type == PA_SUBSCRIPTION_EVENT_NEW) return calls_.OpenStreams();  // those that had no sink
-  if (!defaultSink_.Is(index)) return;
+  if (!defaultSink_.Is(index) && !defaultSink_.WasLast(index)) return;
   if (type == PA_SUBSCRIPTION_EVENT_REMOVE) defaultSink_.OnRemoved();
   AskForDefaultSink();
 }

@@ -6,6 +6,7 @@
 
 #include <unistd.h>
 
+#include <array>
 #include <atomic>
 
 namespace Desktop {
@@ -34,6 +35,7 @@ bool IsInForkedChild() {
 struct Device {
   Picture picture{connection};
   Connection connection{picture};
+  std::array<unsigned, kCategories + 1> sets = {};  // of levels, and of mute-all
 
   /// Throws when memory or threads are short.
   static Device& Get();
@@ -62,7 +64,8 @@ int OnDevice(Operation operation) {
   return operation(made, lock, Connection::Clock::now() + kAnswerLimit);
 }
 
-/// PipeWire acknowledges a change before it can be read: waits until \p isTold after \p refresh.
+/// PipeWire acknowledges a change before it can be read: waits until \p isTold after \p refresh. What
+/// another thread sets meanwhile, as a callback may, is told in its place.
 template <typename Refresh, typename Condition>
 int AwaitReadBack(Device& device, Lock& lock, Time limit, Refresh refresh, Condition isTold) {
   while (device.picture.IsOfPipeWire()) {
@@ -108,12 +111,15 @@ int SoundDevice::SetLevel(int type, int level) {
     // be written with its other fields.
     if (const int error = refresh()) return error;
     if (!volumes.AreStored()) return SOUND_MANAGER_ERROR_INVALID_OPERATION;
+    const unsigned number = ++device.sets[static_cast<std::size_t>(type)];
     Batch batch(device.connection);
     const auto streams = volumes.Send(device.connection.GetContext(), type, level, batch);
     if (!picture.IsOfPipeWire()) batch.WhenDone([&] { volumes.OnDone(type, level, streams); });
     if (const int error = batch.Await(lock, limit)) return error;
-    return AwaitReadBack(device, lock, limit, refresh,
-                         [&] { return volumes.IsToldAs(type, level); });
+    return AwaitReadBack(device, lock, limit, refresh, [&] {
+      const bool isOvertaken = device.sets[static_cast<std::size_t>(type)] != number;
+      return isOvertaken || volumes.IsToldAs(type, level);
+    });
   });
 }
 
@@ -134,6 +140,7 @@ int SoundDevice::SetMuteAll(bool muted) {
     const auto refresh = [&] { return picture.Refresh(lock, limit); };
     // So that what another program changed before is reported first.
     if (const int error = refresh()) return error;
+    const unsigned number = ++device.sets.back();
     Batch batch(device.connection);
     batch.Add([&](pa_context_success_cb_t onAnswer, void* data) {
       return pa_context_set_sink_mute_by_name(device.connection.GetContext(),
@@ -141,8 +148,9 @@ int SoundDevice::SetMuteAll(bool muted) {
     });
     if (!picture.IsOfPipeWire()) batch.WhenDone([&] { defaultSink.OnMuted(muted); });
     if (const int error = batch.Await(lock, limit)) return error;
-    return AwaitReadBack(device, lock, limit, refresh,
-                         [&] { return defaultSink.IsMuted() == muted; });
+    return AwaitReadBack(device, lock, limit, refresh, [&] {
+      return device.sets.back() != number || defaultSink.IsMuted() == muted;
+    });
   });
 }
 

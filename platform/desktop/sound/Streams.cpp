@@ -31,11 +31,13 @@ Streams::Streams() : process_(std::to_string(getpid())) {
 const Stream& Streams::Put(const pa_sink_input_info& info, bool isToldInParts) {
   Stream& stream = streams_[info.index];
   stream.category = FindCategory(pa_proplist_gets(info.proplist, PA_PROP_MEDIA_ROLE));
+  const bool isLeavingSink = isToldInParts && stream.IsHeard() && stream.sink != info.sink;
+  stream.isMoving = info.corked && (stream.isMoving || isLeavingSink);
   stream.sink = info.sink;
   stream.volume.Put(info.volume);
   stream.canChangeVolume = info.has_volume && info.volume_writable;
   stream.isMuted = info.mute;
-  stream.isCorked = info.corked;
+  stream.isCorked = info.corked && !stream.isMoving;
   stream.isVolumeKnown = stream.isVolumeKnown || !isToldInParts || !stream.isCorked ||
                          !pa_cvolume_is_muted(&info.volume);
   stream.isOwn = HasProperty(info, PA_PROP_APPLICATION_PROCESS_ID, process_) &&

@@ -18,7 +18,8 @@ struct Stream {
   bool isVolumeKnown = false;
   bool canChangeVolume = false;
   bool isMuted = false;
-  bool isCorked = false;
+  bool isCorked = true;
+  bool isMoving = false;     ///< to another sink, and told as corked until it is there
   bool isOwn = false;        ///< of this process
   bool isPlayer = false;     ///< of one of this process's players
   bool isBeingRead = false;  ///< an answer about it is on its way
@@ -35,7 +36,7 @@ class Streams {
 
   /// Puts in what is told of a stream.
   /// \param isToldInParts whether a new stream is first told corked and with volume 0, whatever its
-  /// volume is
+  /// volume is, and one that goes over to another sink corked
   /// \return the stream as it is now
   const Stream& Put(const pa_sink_input_info& info, bool isToldInParts);
 

@@ -1,6 +1,5 @@
 #include "SoundServer.h"
 
-#include <poll.h>
 #include <sys/prctl.h>
 #include <sys/socket.h>
 #include <sys/un.h>
@@ -19,7 +18,11 @@
 
 namespace {
 
-constexpr int kStartLimit = 10000;  // ms
+using Clock = std::chrono::steady_clock;
+
+constexpr std::chrono::seconds kStartLimit{10};
+constexpr std::chrono::milliseconds kPause{1};
+constexpr char kSocket[] = "/socket";
 
 void Require(bool condition, const std::string& what) {
   if (!condition) throw std::runtime_error(what);
@@ -30,8 +33,10 @@ std::string MakeHome() {
   Require(mkdtemp(path) != nullptr, "no directory for the sound server");
   setenv("HOME", path, 1);
   setenv("XDG_RUNTIME_DIR", path, 1);
-  setenv("PULSE_STATE_PATH", (path + std::string("/state")).c_str(), 1);
-  setenv("PULSE_SERVER", (std::string("unix:") + path + "/socket").c_str(), 1);
+  for (const char* state : {"PULSE_STATE_PATH", "XDG_STATE_HOME"}) {
+    setenv(state, (path + std::string("/state")).c_str(), 1);
+  }
+  setenv("PULSE_SERVER", (std::string("unix:") + path + kSocket).c_str(), 1);
   setenv("LC_ALL", "C", 1);
   return path;
 }
@@ -48,31 +53,18 @@ const std::string& Home() {
   return home.path;
 }
 
-/// A socket where a server that starts says when it is ready.
-class ReadySocket {
- public:
-  ReadySocket() {
-    const std::string path = Home() + "/ready";
-    unlink(path.c_str());
-    sockaddr_un address = {AF_UNIX, ""};
-    path.copy(address.sun_path, sizeof address.sun_path - 1);
-    Require(bind(socket_, reinterpret_cast<sockaddr*>(&address), sizeof address) == 0,
-            "no socket to hear of the sound server's start");
-    setenv("NOTIFY_SOCKET", path.c_str(), 1);
+/// Waits until a program that starts listens at a socket.
+void AwaitSocket(const std::string& path) {
+  sockaddr_un address = {AF_UNIX, ""};
+  path.copy(address.sun_path, sizeof address.sun_path - 1);
+  const auto end = Clock::now() + kStartLimit;
+  for (bool isThere = false; !isThere; std::this_thread::sleep_for(kPause)) {
+    Require(Clock::now() < end, "nobody listens at " + path);
+    const int probe = socket(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0);
+    isThere = connect(probe, reinterpret_cast<sockaddr*>(&address), sizeof address) == 0;
+    close(probe);
   }
-  ~ReadySocket() { close(socket_); }
-
-  ReadySocket(const ReadySocket&) = delete;
-  ReadySocket& operator=(const ReadySocket&) = delete;
-
-  bool Wait() {
-    pollfd event = {socket_, POLLIN, 0};
-    return poll(&event, 1, kStartLimit) == 1;
-  }
-
- private:
-  const int socket_ = socket(AF_UNIX, SOCK_DGRAM | SOCK_CLOEXEC, 0);
-};
+}
 
 ListedStream ParseStream(const std::string& description) {
   ListedStream stream;
@@ -149,13 +141,24 @@ std::string Program::ReadAll() {
   return text;
 }
 
+namespace {
+
+std::string Output(std::vector<std::string> command) {
+  Program program(command);
+  const std::string output = program.ReadAll();
+  Require(program.Finish() == 0, command[0] + " " + command[1] + " fails");
+  return output;
+}
+
+}  // namespace
+
 const std::vector<std::string> SoundServer::kModules = {"module-null-sink sink_name=first",
                                                         "module-stream-restore"};
 
 SoundServer::SoundServer(std::vector<std::string> modules) : modules_(std::move(modules)) {
   ForgetVolumes();
   modules_.push_back("module-cli-protocol-unix");  // pacmd's
-  modules_.push_back("module-native-protocol-unix socket=" + Home() + "/socket");
+  modules_.push_back("module-native-protocol-unix socket=" + Home() + kSocket);
 }
 
 void SoundServer::ForgetVolumes() { std::filesystem::remove_all(Home() + "/state"); }
@@ -169,49 +172,68 @@ void SoundServer::Start() {
   std::vector<std::string> command = {"pulseaudio", "-n", "--daemonize=no", "--exit-idle-time=-1",
                                       "--log-target=null"};
   for (const std::string& module : modules_) command.insert(command.end(), {"-L", module});
-  ReadySocket ready;
   processes_.emplace_back(std::move(command));
-  Require(ready.Wait(), "the sound server doesn't start");
+  AwaitSocket(Home() + kSocket);  // of the last module
 }
 
-/// PipeWire's session manager ends without a message bus.
+/// PipeWire's session manager ends without a message bus, and is there when a stream can be heard.
+/// Until then the server has another address.
 void SoundServer::StartPipeWire() {
-  const std::string bus = "unix:path=" + Home() + "/bus";
+  const std::string bus = "unix:path=" + Home() + "/bus", socket = Home() + "/pulse/native";
   setenv("DBUS_SESSION_BUS_ADDRESS", bus.c_str(), 1);
-  setenv("PULSE_SERVER", ("unix:" + Home() + "/pulse/native").c_str(), 1);
-  processes_.emplace_back(
-      std::vector<std::string>{"dbus-daemon", "--session", "--nofork", "--address=" + bus});
-  for (const char* program : {"pipewire", "wireplumber", "pipewire-pulse"}) {
-    processes_.emplace_back(std::vector<std::string>{program});
-    std::this_thread::sleep_for(std::chrono::milliseconds(500));
-  }
-  Pactl({"load-module", "module-null-sink", "sink_name=first"});
-  while (Pactl({"get-default-sink"}) != "first\n") Pactl({"set-default-sink", "first"});
+  for (const char* debug : {"PIPEWIRE_DEBUG", "WIREPLUMBER_DEBUG"}) setenv(debug, "0", 1);
+  std::filesystem::remove(Home() + kSocket);
+  const auto start = [&](std::vector<std::string> command, const std::string& its) {
+    processes_.emplace_back(std::move(command));
+    AwaitSocket(its);
+  };
+  start({"dbus-daemon", "--session", "--nofork", "--address=" + bus}, Home() + "/bus");
+  start({"pipewire"}, Home() + "/pipewire-0");
+  processes_.emplace_back(std::vector<std::string>{"wireplumber"});
+  start({"pipewire-pulse"}, socket);
+  Pactl({"--server=" + socket, "load-module", "module-null-sink", "sink_name=first"});
+  const std::vector<std::string> play = {"timeout",
+                                         "2",
+                                         "pacat",
+                                         "--server=" + socket,
+                                         "--raw",
+                                         "--latency-msec=20",
+                                         "--property=media.role=test",
+                                         "/proc/self/stat"};
+  const auto end = Clock::now() + kStartLimit;
+  while (Program(play).Finish() != 0) Require(Clock::now() < end, "PipeWire plays nothing");
+  Pactl({"--server=" + socket, "set-default-sink", "first"});
+  std::filesystem::create_symlink(socket, Home() + kSocket);
 }
 
-void SoundServer::Kill() { processes_.clear(); }
+void SoundServer::Kill() {
+  while (!processes_.empty()) processes_.pop_back();
+}
 
 void SoundServer::Signal(int signal) const { processes_.back().Signal(signal); }
-
-namespace {
-
-std::string Output(std::vector<std::string> command) {
-  Program program(command);
-  const std::string output = program.ReadAll();
-  Require(program.Finish() == 0, command[0] + " " + command[1] + " fails");
-  return output;
-}
-
-}  // namespace
 
 std::string Pactl(std::vector<std::string> arguments) {
   arguments.insert(arguments.begin(), "pactl");
   return Output(std::move(arguments));
 }
 
+void UnloadSink(const std::string& name) {
+  std::istringstream modules(Pactl({"list", "short", "modules"}));
+  for (std::string line; std::getline(modules, line);) {
+    const bool isIts = line.find("sink_name=" + name) != std::string::npos;
+    if (isIts) Pactl({"unload-module", line.substr(0, line.find('\t'))});
+  }
+}
+
 void KillStream(int index) {
-  const std::string answer = Output({"pacmd", "kill-sink-input", std::to_string(index)});
-  Require(answer.empty(), "the sound server doesn't kill the stream: " + answer);
+  const std::string number = std::to_string(index);
+  if (!IsOnPipeWire()) {
+    const std::string answer = Output({"pacmd", "kill-sink-input", number});
+    return Require(answer.empty(), "the sound server doesn't kill the stream: " + answer);
+  }
+  const auto stream = ListStreams("object.serial = \"" + number + "\"").at(0);
+  const std::size_t id = stream.description.find("object.id = \"");
+  Output({"pw-cli", "destroy", std::to_string(std::stoi(stream.description.substr(id + 13)))});
 }
 
 std::vector<ListedStream> ListStreams(const std::string& line) {
@@ -250,8 +272,10 @@ Player::Player(std::vector<std::string> properties, int channels)
   const std::string mark = "test.player = \"" + std::to_string(lastPlayer) + "\"";
   // Each look is a round trip to the server, which makes the stream meanwhile.
   for (int look = 0; look < 1000 && index_ < 0; ++look) {
-    const auto streams = ListStreams(mark);
-    if (!streams.empty()) index_ = streams.front().index;
+    for (const ListedStream& stream : ListStreams(mark)) {
+      const bool hasSink = stream.description.find("Sink: 4294967295") == std::string::npos;
+      if (hasSink) index_ = stream.index;
+    }
   }
   Require(index_ >= 0, "pacat's stream doesn't come");
 }

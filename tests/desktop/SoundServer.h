@@ -45,12 +45,13 @@ class Program {
 /// \return whether the server is a PipeWire, as the environment variable ZELKORA_TEST_PIPEWIRE asks
 bool IsOnPipeWire();
 
-/// A PulseAudio or PipeWire with a null sink, in directories of its own. Points this process, and the programs
-/// that it starts, to the server. Running or not, it has always the same address.
+/// A PulseAudio, or a PipeWire, with a null sink "first", in directories of its own. Points this process,
+/// and the programs that it starts, to the server. Running or not, it has always the same address.
 class SoundServer {
  public:
   static const std::vector<std::string> kModules;
 
+  /// \param modules PulseAudio's
   explicit SoundServer(std::vector<std::string> modules = kModules);
   ~SoundServer();
 
@@ -87,13 +88,16 @@ struct ListedStream {
 /// Runs `pactl` and returns its output. Throws when it fails.
 std::string Pactl(std::vector<std::string> arguments);
 
+/// Takes a null sink away.
+void UnloadSink(const std::string& name);
+
 /// Ends another program's playback stream, which `pactl` can't. Throws when the server refuses.
 void KillStream(int index);
 
 /// \return the playback streams that have a line of this text: `media.role = "music"`
 std::vector<ListedStream> ListStreams(const std::string& line);
 
-/// Plays silence with `pacat`, and waits until `pactl` lists the stream.
+/// Plays silence with `pacat`, and waits until `pactl` lists the stream on a sink.
 /// \param properties the stream's, as "key=value"
 class Player : public Program {
  public:

@@ -121,8 +121,10 @@ TEST_F(CommandLine, FilmstripHasEachKeyFrameOnceOrLeavesNothing) {
            AllOf(StartsWith("zelkora: "), HasSubstr(output)));
   }
   Expect("$Z filmstrip a.mp4 -o - | head -c 4", 0, "\x89PNG");
+#ifndef UNDER_EMULATION  // qemu writes a file of its own, which ends it
   Expect("(ulimit -f 0; $Z filmstrip a.mp4 2>&1) | cat", 0,
          "zelkora: cannot write strip.png: File too large\n");
+#endif
   Expect("ls -A", 0, "folder.png\nnull.png\n");
   for (const auto& [options, strip, note] :
        {std::tuple{"-n 1", "1 frame, 272 x 193", ""},

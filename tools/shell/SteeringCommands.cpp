@@ -17,16 +17,19 @@
 namespace CommandLine {
 namespace {
 
-constexpr Named<result> kResults[] = {
-    {"E_SUCCESS", E_SUCCESS},
-    {"E_INVALID_ARG", E_INVALID_ARG},
-    {"E_INVALID_OPERATION", E_INVALID_OPERATION},
-    {"E_INVALID_STATE", E_INVALID_STATE},
-    {"E_OBJ_NOT_FOUND", E_OBJ_NOT_FOUND},
-    {"E_OUT_OF_MEMORY", E_OUT_OF_MEMORY},
-    {"E_PRIVILEGE_DENIED", E_PRIVILEGE_DENIED},
-    {"E_SYSTEM", E_SYSTEM},
-    {"E_UNSUPPORTED_OPERATION", E_UNSUPPORTED_OPERATION},
+/// \return a result with the name that it has in the log
+Named<result> NameResult(result r) noexcept { return {GetErrorMessage(r), r}; }
+
+const Named<result> kResults[] = {
+    NameResult(E_SUCCESS),
+    NameResult(E_INVALID_ARG),
+    NameResult(E_INVALID_OPERATION),
+    NameResult(E_INVALID_STATE),
+    NameResult(E_OBJ_NOT_FOUND),
+    NameResult(E_OUT_OF_MEMORY),
+    NameResult(E_PRIVILEGE_DENIED),
+    NameResult(E_SYSTEM),
+    NameResult(E_UNSUPPORTED_OPERATION),
 };
 
 constexpr Named<result> kPrivilegeAnswers[] = {{"granted", E_SUCCESS},

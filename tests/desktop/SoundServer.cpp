@@ -192,16 +192,14 @@ void SoundServer::StartPipeWire() {
   processes_.emplace_back(std::vector<std::string>{"wireplumber"});
   start({"pipewire-pulse"}, socket);
   Pactl({"--server=" + socket, "load-module", "module-null-sink", "sink_name=first"});
-  const std::vector<std::string> play = {"timeout",
-                                         "2",
-                                         "pacat",
-                                         "--server=" + socket,
-                                         "--raw",
-                                         "--latency-msec=20",
-                                         "--property=media.role=test",
-                                         "/proc/self/stat"};
+  const std::string play =
+      "timeout 2 pacat --raw --latency-msec=20 --property=media.role=test "
+      "/proc/self/stat --server=" +
+      socket;
   const auto end = Clock::now() + kStartLimit;
-  while (Program(play).Finish() != 0) Require(Clock::now() < end, "PipeWire plays nothing");
+  while (Program({"sh", "-c", play}).Finish() != 0) {
+    Require(Clock::now() < end, "PipeWire plays nothing");
+  }
   Pactl({"--server=" + socket, "set-default-sink", "first"});
   std::filesystem::create_symlink(socket, Home() + kSocket);
 }

@@ -1,4 +1,5 @@
-// The events' dispatch, which only the platform calls. The library's sources are part of this program.
+// The events' dispatch, which only the platform calls. The library's sources are part of this
+// program.
 
 #include "managers/Listeners.h"
 #include "session/AudioSessionEvent.h"

@@ -1,5 +1,5 @@
-// Memory that is short at any place of any public operation, in processes of their own: no exception,
-// nothing leaked, a listed result, and the next attempt succeeds.
+// Memory that is short at any place of any public operation, in processes of their own: no
+// exception, nothing leaked, a listed result, and the next attempt succeeds.
 
 #include "support/Allocations.h"
 #include "support/Operations.h"

@@ -18,7 +18,8 @@
 #include <set>
 #include <thread>
 
-/// Asks the sanitizer, if there is one, for no leaks: it takes what the parent's threads hold for lost.
+/// Asks the sanitizer, if there is one, for no leaks: it takes what the parent's threads hold for
+/// lost.
 static bool hasLostThreads = false;
 extern "C" int __lsan_is_turned_off();
 extern "C" int __lsan_is_turned_off() { return hasLostThreads; }

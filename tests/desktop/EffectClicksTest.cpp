@@ -1,5 +1,5 @@
-// Changes of the effects while sound goes through them, heard at the end of the chain that is in every
-// player's pipeline. It runs alone here, without a clock, a change a buffer.
+// Changes of the effects while sound goes through them, heard at the end of the chain that is in
+// every player's pipeline. It runs alone here, without a clock, a change a buffer.
 
 #include "GstreamerEnd.h"
 #include "desktop/player/effects/Chain.h"
@@ -87,8 +87,8 @@ class Listening {
   std::size_t sent_ = 0;
 };
 
-/// \return the height of the highest step. The third difference, halved, is a step's height, and next
-/// to nothing for a tone of 440 Hz.
+/// \return the height of the highest step. The third difference, halved, is a step's height, and
+/// next to nothing for a tone of 440 Hz.
 double LoudestClick(const std::vector<float>& samples) {
   double loudest = 0;
   for (std::size_t i = 6; i < samples.size(); i += 2) {

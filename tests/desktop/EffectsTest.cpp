@@ -1,5 +1,5 @@
-// The desktop player's effects, on sound that sox makes and measures: it is rendered with the effects
-// that are set, and the file is judged.
+// The desktop player's effects, on sound that sox makes and measures: it is rendered with the
+// effects that are set, and the file is judged.
 
 #include "GstreamerEnd.h"
 

@@ -45,8 +45,9 @@ class Program {
 /// \return whether the server is a PipeWire, as the environment variable ZELKORA_TEST_PIPEWIRE asks
 bool IsOnPipeWire();
 
-/// A PulseAudio, or a PipeWire, with a null sink "first", in directories of its own. Points this process,
-/// and the programs that it starts, to the server. Running or not, it has always the same address.
+/// A PulseAudio, or a PipeWire, with a null sink "first", in directories of its own. Points this
+/// process, and the programs that it starts, to the server. Running or not, it has always the same
+/// address.
 class SoundServer {
  public:
   static const std::vector<std::string> kModules;

@@ -128,8 +128,8 @@ struct Counter : IAudioVolumeEventListener {
 
 /// \return how many changes are reported to that many listeners: `ZELKORA_TEST_SCALE` per cent of a
 /// million. Unless the environment says it, 1 and 10 listeners get the whole million and 1,000 a
-/// tenth of it, which is 100 million calls; in emulation and under sanitizers, which take some fifty
-/// times as long, it is one per cent for all.
+/// tenth of it, which is 100 million calls; in emulation and under sanitizers, which take some
+/// fifty times as long, it is one per cent for all.
 int Changes(int listeners) {
   const char* scale = std::getenv("ZELKORA_TEST_SCALE");
   const int usual = listeners < 1000 ? ZELKORA_TEST_SCALE : (ZELKORA_TEST_SCALE + 9) / 10;

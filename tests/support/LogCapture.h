@@ -16,9 +16,8 @@ class LogCapture {
   LogCapture() { Host::SetLogSink(&LogCapture::Receive, this); }
   ~LogCapture() { Host::SetLogSink(nullptr, nullptr); }
 
-  /// \return the lines since the last call, in order: "80: text", "80 info: text",
-  /// "ZELKORA_MEDIA: text", "assertion: text". A result that the text doesn't name stands before the
-  /// colon.
+  /// \return the lines since the last call, in order: "80: text", "80 info: text", "ZELKORA_MEDIA:
+  /// text", "assertion: text". A result that the text doesn't name stands before the colon.
   Lines Take();
 
   /// The one that lines of the application family must be signed with, if any.

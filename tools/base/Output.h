@@ -16,8 +16,8 @@ void Print(std::string_view text);
 void RequireOutput();
 
 /// To be called first. Keeps the numbers of closed standard streams from files that are opened
-/// later, which would else receive what is printed. A pipe that nobody reads any more and a limit of
-/// a file's size are errors of writing from now on, not signals.
+/// later, which would else receive what is printed. A pipe that nobody reads any more and a limit
+/// of a file's size are errors of writing from now on, not signals.
 void ReserveStandardStreams();
 
 }  // namespace CommandLine

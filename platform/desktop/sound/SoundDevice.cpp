@@ -64,8 +64,8 @@ int OnDevice(Operation operation) {
   return operation(made, lock, Connection::Clock::now() + kAnswerLimit);
 }
 
-/// PipeWire acknowledges a change before it can be read: waits until \p isTold after \p refresh. What
-/// another thread sets meanwhile, as a callback may, is told in its place.
+/// PipeWire acknowledges a change before it can be read: waits until \p isTold after \p refresh.
+/// What another thread sets meanwhile, as a callback may, is told in its place.
 template <typename Refresh, typename Condition>
 int AwaitReadBack(Device& device, Lock& lock, Time limit, Refresh refresh, Condition isTold) {
   while (device.picture.IsOfPipeWire()) {

@@ -1,5 +1,6 @@
-/// \file The device that the managers' tests run on: one such file of functions for the simulated
-/// device, one for a desktop with a sound server of the test's own.
+/// \file
+/// The device that the managers' tests run on: one such file of functions for the simulated device,
+/// one for a desktop with a sound server of the test's own.
 #pragma once
 
 #include <vector>

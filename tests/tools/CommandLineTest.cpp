@@ -121,7 +121,8 @@ TEST_F(CommandLine, FilmstripHasEachKeyFrameOnceOrLeavesNothing) {
            AllOf(StartsWith("zelkora: "), HasSubstr(output)));
   }
   Expect("$Z filmstrip a.mp4 -o - | head -c 4", 0, "\x89PNG");
-#ifndef UNDER_EMULATION  // qemu writes a file of its own, which ends it
+// qemu and the runtime of ThreadSanitizer write files of their own, which ends them.
+#if !defined(UNDER_EMULATION) && !defined(__SANITIZE_THREAD__)
   Expect("(ulimit -f 0; $Z filmstrip a.mp4 2>&1) | cat", 0,
          "zelkora: cannot write strip.png: File too large\n");
 #endif

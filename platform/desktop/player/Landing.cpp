@@ -63,8 +63,9 @@ int Landing::TryContainer(FilmTime time, std::optional<Landed>* landed) {
 /// Leaves \p landed empty when there is no key frame at the listed time.
 int Landing::CorrectByList(FilmTime time, std::optional<Landed>* landed) {
   const auto& listed = film_.GetListed();
+  if (listed.empty() || !*landed) return PLAYER_ERROR_NONE;
   const auto shown = pipeline_.GetShown();
-  if (!*landed || !shown || listed.empty()) return PLAYER_ERROR_NONE;
+  if (!shown) return PLAYER_ERROR_NONE;
   const FilmTime shift = static_cast<FilmTime>(shown->stamp) - shown->time;
   FilmTime limit = time;
   // Listed times are whole milliseconds: the key frame may be a little later, and then after the

@@ -225,11 +225,13 @@ class LibraryListener : public Zelkora::Media::IAudioVolumeEventListener {
 
 void Print(const std::string& name, double time) { std::printf("%s %f\n", name.c_str(), time); }
 
-/// Sets and gets in any order.
+/// Sets and gets in any order, each when what the one before it has left to do is done: a report to
+/// the program, and the reading of what has changed, which a call straight afterwards waits for.
 template <typename Set, typename Get>
 void PrintCalls(const std::string& side, Set set, Get get) {
   std::mt19937 random(std::random_device{}());
   for (int i = 0; i < 2 * kRounds; ++i) {
+    std::this_thread::sleep_for(std::chrono::milliseconds(1));
     if (random() % 2 == 0) {
       const int level = static_cast<int>(random() % kMax);
       Print(side + "-set", Measure([&] { set(level); }));

@@ -107,9 +107,10 @@ int SoundDevice::SetLevel(int type, int level) {
     Picture& picture = device.picture;
     Desktop::Volumes& volumes = picture.GetVolumes();
     const auto refresh = [&] { return picture.Refresh(lock, limit); };
-    // So that what another program changed before is reported first; and a stored volume can only
-    // be written with its other fields.
-    if (const int error = refresh()) return error;
+    if (const int error = picture.Await(lock, limit)) return error;
+    if (picture.IsOfPipeWire()) {  // a stored volume is written with its other fields
+      if (const int error = refresh()) return error;
+    }
     if (!volumes.AreStored()) return SOUND_MANAGER_ERROR_INVALID_OPERATION;
     const unsigned number = ++device.sets[static_cast<std::size_t>(type)];
     Batch batch(device.connection);
@@ -138,8 +139,7 @@ int SoundDevice::SetMuteAll(bool muted) {
     Picture& picture = device.picture;
     Desktop::DefaultSink& defaultSink = picture.GetDefaultSink();
     const auto refresh = [&] { return picture.Refresh(lock, limit); };
-    // So that what another program changed before is reported first.
-    if (const int error = refresh()) return error;
+    if (const int error = picture.Await(lock, limit)) return error;
     const unsigned number = ++device.sets.back();
     Batch batch(device.connection);
     batch.Add([&](pa_context_success_cb_t onAnswer, void* data) {

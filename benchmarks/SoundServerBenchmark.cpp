@@ -292,11 +292,12 @@ double GetProcessorTime() {
   return static_cast<double>(time.tv_sec) * 1e6 + static_cast<double>(time.tv_nsec) / 1e3;
 }
 
-/// How often the threads of a process have gone to sleep.
+/// How often the threads of a process have gone to sleep, but for the one that counts.
 long CountSleeps(pid_t process) {
   long sum = 0;
   const std::filesystem::path threads = "/proc/" + std::to_string(process) + "/task";
   for (const auto& thread : std::filesystem::directory_iterator(threads)) {
+    if (thread.path().filename() == std::to_string(gettid())) continue;
     std::ifstream status(thread.path() / "status");
     for (std::string word; status >> word;) {
       if (word != "voluntary_ctxt_switches:") continue;
@@ -317,8 +318,7 @@ void PrintWhatWaitingTakes() {
   while (std::getchar() != EOF) {
   }
   Print("processor", GetProcessorTime() - time);
-  // Without the one for the input.
-  Print("sleeps", static_cast<double>(CountSleeps(getpid()) - sleeps - 1));
+  Print("sleeps", static_cast<double>(CountSleeps(getpid()) - sleeps));
 }
 
 /// All three managers, as a program has them that listens.

@@ -167,9 +167,9 @@ void Calls::OnFailed(Call& call) {
   call.error = pa_context_errno(context);
   if (pa_context_get_state(context) != PA_CONTEXT_READY || !call.isWanted) return;
   const bool wasOpen = call.index != PA_INVALID_INDEX;
-  LogFailure(wasOpen ? "The call session was ended" : "The call session isn't opened",
-             pa_strerror(call.error));
-  if (wasOpen) owner_.OnCallKilled(call.index);
+  if (!wasOpen) return;  // which is told to the caller
+  LogFailure("The call session was ended", pa_strerror(call.error));
+  owner_.OnCallKilled(call.index);
 }
 
 void Calls::OnWanted(pa_stream* stream, std::size_t size, void*) {

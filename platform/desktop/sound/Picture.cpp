@@ -21,24 +21,14 @@ void Forget(pa_operation* operation) { OperationPtr{operation}; }
 }  // namespace
 
 int Picture::Await(Connection::Lock& lock, Connection::Time limit) {
-  const int error = AwaitPicture(lock, limit);
-  return error != SOUND_MANAGER_ERROR_NONE ? error : AwaitAnswers(lock, limit);
-}
-
-int Picture::Refresh(Connection::Lock& lock, Connection::Time limit) {
-  if (const int error = AwaitPicture(lock, limit)) return error;
-  AskForServer();
-  if (isPipeWire_) AskForEntries();  // no event tells of them
-  return AwaitAnswers(lock, limit);
-}
-
-int Picture::AwaitPicture(Connection::Lock& lock, Connection::Time limit) {
   connection_.Connect();  // at once, even if the time of the next attempt hasn't come
   return connection_.Await(lock, limit, [this] { return isComplete_; });
 }
 
-/// An answer may lead to another question, of which the answer is awaited too.
-int Picture::AwaitAnswers(Connection::Lock& lock, Connection::Time limit) {
+int Picture::Refresh(Connection::Lock& lock, Connection::Time limit) {
+  if (const int error = Await(lock, limit)) return error;
+  AskForServer();
+  if (isPipeWire_) AskForEntries();  // no event tells of them
   for (int turn = 0; turn < 2; ++turn) {
     const auto isAnswered = [this, asked = asked_] { return answered_ >= asked; };
     if (const int error = connection_.Await(lock, limit, isAnswered)) return error;

@@ -27,8 +27,7 @@ class Picture final : public Connection::Owner, private Calls::Owner {
   bool IsOfPipeWire() const { return isPipeWire_; }
   /// @}
 
-  /// Waits until there is a picture, having begun to connect if need be, and for the answers about
-  /// what the server has told so far. \return a native code
+  /// Waits until there is a picture, having begun to connect if need be. \return a native code
   int Await(Connection::Lock& lock, Connection::Time limit);
 
   /// Waits for one answer of the server, which comes behind the events of all that happened before,
@@ -42,9 +41,6 @@ class Picture final : public Connection::Owner, private Calls::Owner {
   void OnConnected(pa_context* context) override;
   void OnDisconnected(bool isLost) override;
   void OnCallKilled(std::uint32_t stream) override;
-
-  int AwaitPicture(Connection::Lock& lock, Connection::Time limit);
-  int AwaitAnswers(Connection::Lock& lock, Connection::Time limit);
 
   /// \name Questions
   /// @{

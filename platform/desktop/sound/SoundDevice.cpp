@@ -2,6 +2,7 @@
 
 #include "native/SoundDevice.h"
 
+#include "Log.h"
 #include "Picture.h"
 
 #include <unistd.h>
@@ -55,13 +56,25 @@ Device& Device::Get() {
   return made;
 }
 
+const char* Describe(int error) {
+  switch (error) {
+    case SOUND_MANAGER_ERROR_NO_CONNECTION: return "the sound server can't be reached";
+    case SOUND_MANAGER_ERROR_INVALID_OPERATION: return "the sound server can't do that now";
+    case kTimedOut: return "the sound server doesn't answer";
+    case kAccessRefused: return "the sound server refuses access";
+    default: return "the sound server fails";
+  }
+}
+
 /// Runs \p operation on the device under its lock. \return a native code
 template <typename Operation>
 int OnDevice(Operation operation) {
   if (IsInForkedChild()) return SOUND_MANAGER_ERROR_NO_CONNECTION;
   Device& made = Device::Get();
   Lock lock = made.connection.Acquire();
-  return operation(made, lock, Connection::Clock::now() + kAnswerLimit);
+  const int error = operation(made, lock, Connection::Clock::now() + kAnswerLimit);
+  if (error != SOUND_MANAGER_ERROR_NONE) LogReason(Describe(error));
+  return error;
 }
 
 /// PipeWire acknowledges a change before it can be read: waits until \p isTold after \p refresh.
@@ -107,10 +120,9 @@ int SoundDevice::SetLevel(int type, int level) {
     Picture& picture = device.picture;
     Desktop::Volumes& volumes = picture.GetVolumes();
     const auto refresh = [&] { return picture.Refresh(lock, limit); };
-    if (const int error = picture.Await(lock, limit)) return error;
-    if (picture.IsOfPipeWire()) {  // a stored volume is written with its other fields
-      if (const int error = refresh()) return error;
-    }
+    // So that what another program changed before is reported first; and a stored volume can only
+    // be written with its other fields.
+    if (const int error = refresh()) return error;
     if (!volumes.AreStored()) return SOUND_MANAGER_ERROR_INVALID_OPERATION;
     const unsigned number = ++device.sets[static_cast<std::size_t>(type)];
     Batch batch(device.connection);
@@ -139,7 +151,8 @@ int SoundDevice::SetMuteAll(bool muted) {
     Picture& picture = device.picture;
     Desktop::DefaultSink& defaultSink = picture.GetDefaultSink();
     const auto refresh = [&] { return picture.Refresh(lock, limit); };
-    if (const int error = picture.Await(lock, limit)) return error;
+    // So that what another program changed before is reported first.
+    if (const int error = refresh()) return error;
     const unsigned number = ++device.sets.back();
     Batch batch(device.connection);
     batch.Add([&](pa_context_success_cb_t onAnswer, void* data) {

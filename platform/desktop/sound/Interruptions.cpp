@@ -18,9 +18,10 @@ bool IsPlugged(const pa_sink_info& info, const std::string& port) {
 void DefaultSink::Put(const pa_sink_info& info) {
   const bool isSuspended = info.state == PA_SINK_SUSPENDED;
   if (Is(info.index)) {
-    if (WasUnplugged(info)) reports_.ReportInterruption(kOutputGone);
     // A sink that is idle may be suspended by the server itself; one that plays only by a program.
-    if (isSuspended && !sink_->isSuspended && streams_.IsPlayerHeardOn(info.index)) {
+    if (WasUnplugged(info)) {
+      reports_.ReportInterruption(kOutputGone);
+    } else if (isSuspended && !sink_->isSuspended && streams_.IsPlayerHeardOn(info.index)) {
       reports_.ReportInterruption(kTakenOver);
     }
   }

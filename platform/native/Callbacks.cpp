@@ -73,22 +73,21 @@ void Post(Kind kind, int first, int second) {
 
 }  // namespace
 
-bool IsListening(Kind kind) { return TheSlots().Of(kind).registration != 0; }
-
 void ReportLevel(int type, int level) { Post(Kind::kVolume, type, level); }
 
 void ReportMuteAll(bool isMuted) { Post(Kind::kMuteAll, isMuted, 0); }
 
 void ReportInterruption(int code) { Post(Kind::kInterruption, code, 0); }
 
-void SetCallback(Kind kind, Callback callback, void* userData) {
+bool SetCallback(Kind kind, Callback callback, void* userData) {
   Worker& worker = TheWorker();
-  if (!worker.Start()) return;
+  if (!worker.Start()) return false;
   const auto lock = worker.Acquire();
   Slot& slot = TheSlots().Of(kind);
   slot.callback = callback;
   slot.userData = userData;
   TheSlots().Register(slot);
+  return true;
 }
 
 void UnsetCallback(Kind kind) {
@@ -102,6 +101,7 @@ void UnsetCallback(Kind kind) {
 }
 
 void DropReports() {
+  if (TheWorker().IsForked()) return;
   const auto lock = TheWorker().Acquire();
   for (Slot& slot : TheSlots().all) {
     if (slot.registration != 0) TheSlots().Register(slot);

@@ -19,7 +19,8 @@ using Callback = void (*)();
 
 /// Sets the callback for reports of a kind, those from now on. Throws `std::bad_alloc` or
 /// `std::system_error`.
-void SetCallback(Kind kind, Callback callback, void* userData);
+/// \return false when nothing is told any more: in a forked child, and when the process is ending
+bool SetCallback(Kind kind, Callback callback, void* userData);
 
 /// Removes it. No call of it is running when this returns, unless this is called from inside a
 /// callback.

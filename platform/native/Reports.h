@@ -6,9 +6,6 @@ namespace Native {
 
 enum class Kind { kVolume, kMuteAll, kInterruption };
 
-/// \return whether the program has set a callback for reports of a kind.
-bool IsListening(Kind kind);
-
 /// \name Reports
 /// Queued for the program's callback, if there is one, which is called on another thread: a device
 /// may report with its own lock held. Throw `std::bad_alloc`, with nothing done.

@@ -33,7 +33,9 @@ int SetCallback(std::optional<int> failure, Kind kind, Function callback, void* 
       SoundDevice::AwaitReports();
       Native::WaitUntilReported();
     });
-    Native::SetCallback(kind, reinterpret_cast<Native::Callback>(callback), userData);
+    if (!Native::SetCallback(kind, reinterpret_cast<Native::Callback>(callback), userData)) {
+      return int{SOUND_MANAGER_ERROR_NO_CONNECTION};
+    }
     SoundDevice::OnListening(kind, true);
     return kOk;
   });

@@ -18,7 +18,6 @@
 #include <condition_variable>
 #include <cstdio>
 #include <cstdlib>
-#include <cstring>
 #include <ctime>
 #include <exception>
 #include <filesystem>
@@ -40,7 +39,9 @@ using Clock = std::chrono::steady_clock;
 constexpr int kProcesses = 300;  // of each side
 constexpr int kRounds = 20;      // in each of them
 constexpr int kMax = 15;
-constexpr char kEntry[] = "sink-input-by-media-role:music";
+constexpr const char* kEntries[] = {"sink-input-by-media-role:music",
+                                    "sink-input-by-media-role:video",
+                                    "sink-input-by-media-role:game"};
 
 void Require(bool condition, const char* what) {
   if (!condition) throw std::runtime_error(what);
@@ -48,10 +49,12 @@ void Require(bool condition, const char* what) {
 
 pa_volume_t ToVolume(int level) { return static_cast<pa_volume_t>((level * 65536 + 7) / kMax); }
 
-/// A program's own use of libpulse: a threaded main loop, and a wait for each answer.
+/// A program's own use of libpulse: a threaded main loop, and a wait for each answer. It asks the
+/// server what the device asks it.
 class Direct {
  public:
   Direct() : loop_(pa_threaded_mainloop_new()) {
+    pa_channel_map_init_stereo(&map_);
     context_ = pa_context_new(pa_threaded_mainloop_get_api(loop_), "direct");
     pa_context_set_state_callback(
         context_, [](pa_context*, void* self) { Wake(self); }, this);
@@ -75,17 +78,27 @@ class Direct {
   Direct(const Direct&) = delete;
   Direct& operator=(const Direct&) = delete;
 
-  int GetLevel() {
-    Locked([&] { Read(); });
-    return static_cast<int>((pa_cvolume_max(&entry_.volume) * kMax + 32768) / 65536);
+  /// As a getter does, whose picture is up to date behind any answer.
+  void AskForServer() {
+    Locked([&] { Await(pa_context_get_server_info(context_, OnServer, this)); });
   }
 
-  void SetLevel(int level) {
+  /// Of media, with its one stream.
+  void SetLevel(int stream, int level) {
+    AskForServer();
+    pa_cvolume volume;
+    pa_cvolume_set(&volume, 2, ToVolume(level));
+    std::vector<pa_ext_stream_restore_info> entries;
+    for (const char* name : kEntries) {
+      entries.push_back({name, map_, volume, nullptr, 0});
+    }
     Locked([&] {
-      Read();
-      pa_cvolume_scale(&entry_.volume, ToVolume(level));
-      Await(pa_ext_stream_restore_write(context_, PA_UPDATE_REPLACE, &entry_, 1, true, OnSuccess,
-                                        this));
+      pa_operation* stored =
+          pa_ext_stream_restore_write(context_, PA_UPDATE_REPLACE, entries.data(),
+                                      unsigned(entries.size()), false, OnSuccess, this);
+      Await(pa_context_set_sink_input_volume(context_, static_cast<std::uint32_t>(stream), &volume,
+                                             OnSuccess, this));
+      Await(stored);
     });
   }
 
@@ -127,21 +140,7 @@ class Direct {
     pa_operation_unref(operation);
   }
 
-  void Read() {
-    entry_.name = nullptr;
-    Await(pa_ext_stream_restore_read(context_, OnEntry, this));
-    Require(entry_.name != nullptr, "nothing is stored for music");
-  }
-
-  static void OnEntry(pa_context*, const pa_ext_stream_restore_info* info, int end, void* self) {
-    auto& direct = *static_cast<Direct*>(self);
-    if (end != 0) return Wake(self);
-    if (std::strcmp(info->name, kEntry) != 0) return;
-    direct.entry_ = *info;
-    direct.entry_.name = kEntry;
-    direct.device_ = info->device != nullptr ? info->device : "";
-    direct.entry_.device = info->device != nullptr ? direct.device_.c_str() : nullptr;
-  }
+  static void OnServer(pa_context*, const pa_server_info*, void* self) { Wake(self); }
 
   static void OnEvent(pa_context* context, pa_subscription_event_type_t, std::uint32_t index,
                       void* self) {
@@ -156,8 +155,7 @@ class Direct {
 
   pa_threaded_mainloop* loop_;
   pa_context* context_;
-  pa_ext_stream_restore_info entry_ = {};
-  std::string device_;
+  pa_channel_map map_;
   std::function<void(int)> changed_;
 };
 
@@ -249,10 +247,10 @@ void PrintLibraryCalls(int) {
       [&] { volume->GetCurrentMediaVolumeLevel(); });
 }
 
-void PrintDirectCalls(int) {
+void PrintDirectCalls(int stream) {
   Direct direct;
   PrintCalls(
-      "direct", [&](int level) { direct.SetLevel(level); }, [&] { direct.GetLevel(); });
+      "direct", [&](int level) { direct.SetLevel(stream, level); }, [&] { direct.AskForServer(); });
 }
 
 /// From a change by another client until the listener has the level.

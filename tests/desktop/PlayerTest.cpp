@@ -75,7 +75,6 @@ TEST_F(PlayerTest, ExactSeekTellsKeyFramesFromOthersAndReturnsToEachReportedPosi
 }
 
 TEST_F(PlayerTest, WhatCantBeOpenedIsRefusedWithItsReason) {
-  WriteFile(Media("cut.mp4"), ReadFile(Media("movie.mp4")).substr(0, 60000));
   mkfifo(Media("pipe.webm").c_str(), 0600);
   const struct {
     const char* name;
@@ -222,7 +221,8 @@ TEST_F(PlayerTest, ClockThatJumpsIsRefusedInWordsFromThereOn) {
     EXPECT_EQ(seeker.SeekTo(asked), expected < 0 ? E_SYSTEM : E_SUCCESS);
     EXPECT_EQ(GetCapturedStderr().find("doesn't find the key frame") == std::string::npos,
               expected >= 0);
-    EXPECT_EQ(player.GetPosition() == expected, expected >= 0);
+    EXPECT_EQ(player.GetPosition(), expected < 0 ? 11000 : expected) << "lost its place";
+    Capture();
   }
 }
 

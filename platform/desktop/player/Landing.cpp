@@ -26,13 +26,12 @@ constexpr int kBrokenLimit = 4;
 
 int Landing::LandAtOrBefore(FilmTime time, std::optional<Landed>* landed) {
   std::optional<Landed> reached;
+  bool isFirst = false;
   if (film_.IsTrusted()) {
-    if (const int error = TryContainer(time, &reached)) return error;
+    if (const int error = TryContainer(time, &reached, &isFirst)) return error;
     if (const int error = CorrectByList(time, &reached)) return error;
   }
-  const bool isThere = reached && (reached->time <= time ||
-                                   (film_.FindIndex() != nullptr && IsFirst(reached->time)));
-  if (!isThere) {
+  if (!reached || (reached->time > time && !isFirst)) {
     const int error =
         film_.FindIndex() != nullptr ? LandByIndex(time, &reached) : LandSomewhere(time, &reached);
     if (error != PLAYER_ERROR_NONE) return error;
@@ -41,9 +40,11 @@ int Landing::LandAtOrBefore(FilmTime time, std::optional<Landed>* landed) {
   return PLAYER_ERROR_NONE;
 }
 
-/// Leaves \p landed empty when the container led to no key frame. It may be one after \p time.
-int Landing::TryContainer(FilmTime time, std::optional<Landed>* landed) {
+/// Leaves \p landed empty when the container led to no key frame. It may be one after \p time: the
+/// file's first one, if nothing comes before it.
+int Landing::TryContainer(FilmTime time, std::optional<Landed>* landed, bool* isFirst) {
   FilmTime target = time;
+  std::optional<FilmTime> before;
   // A time between a key frame's decoding and its showing leads to that key frame: once more, then.
   for (int i = 0; i < 2; ++i) {
     landed->reset();
@@ -54,7 +55,9 @@ int Landing::TryContainer(FilmTime time, std::optional<Landed>* landed) {
     if (!keyFrame) break;
     *landed = Landed{shown->time, true, true, shown->time};
     target = shown->time - static_cast<FilmTime>(keyFrame->reordering) - kRounding;
-    if (shown->time <= time || target < 0) break;
+    *isFirst = target < 0 || before == shown->time;
+    if (shown->time <= time || *isFirst) break;
+    before = shown->time;
   }
   return PLAYER_ERROR_NONE;
 }
@@ -161,12 +164,6 @@ bool Landing::IsKeyFrame(const Shown& shown) const {
 int Landing::Seek(FilmTime time, GstSeekFlags manner, std::optional<TimeSpan> first) {
   pipeline_.GetGate().Prepare(first);
   return pipeline_.Move(time, manner);
-}
-
-bool Landing::IsFirst(FilmTime keyFrame) const {
-  const KeyFrameIndex* index = film_.GetIndex();
-  return index != nullptr && !index->keyFrames.empty() &&
-         FindAtOrBefore(index->keyFrames, keyFrame + kRounding) == index->keyFrames.begin();
 }
 
 }  // namespace Desktop

@@ -36,14 +36,13 @@ class Landing {
   bool IsOnKeyFrame() const;
 
  private:
-  int TryContainer(FilmTime time, std::optional<Landed>* landed);
+  int TryContainer(FilmTime time, std::optional<Landed>* landed, bool* isFirst);
   int CorrectByList(FilmTime time, std::optional<Landed>* landed);
   int LandByIndex(FilmTime time, std::optional<Landed>* landed);
   int LandAt(FilmTime keyFrame, std::optional<Landed>* landed);
   int LandSomewhere(FilmTime time, std::optional<Landed>* landed);
   int Seek(FilmTime time, GstSeekFlags manner, std::optional<TimeSpan> first);
   bool IsAtGate() const;
-  bool IsFirst(FilmTime keyFrame) const;
   bool IsKeyFrame(const Shown& shown) const;
 
   Pipeline& pipeline_;

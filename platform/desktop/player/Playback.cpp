@@ -87,10 +87,19 @@ int Playback::Seek(long position, bool exact) {
   if (isPlaying_) {
     if (const int error = Pause()) return error;
   }
+  FilmTime before = 0;
+  const bool wasSomewhere = FindTime(&before) == PLAYER_ERROR_NONE;
   const int error = Land(position, exact);
+  // A gate that waits for a key frame in vain stays closed until the next seek.
+  if (error != PLAYER_ERROR_NONE && wasSomewhere && !pipeline_.IsBroken()) GoBack(before);
   if (!goesOn || pipeline_.IsBroken()) return error;
   const int playError = Play();
   return error == PLAYER_ERROR_NONE ? playError : error;
+}
+
+/// To where a seek that failed began.
+void Playback::GoBack(FilmTime time) {
+  if (landing_.GoTo(time) == PLAYER_ERROR_NONE) isKeyFrame_ = landing_.IsOnKeyFrame();
 }
 
 int Playback::Land(long position, bool exact) {
@@ -135,9 +144,14 @@ int Playback::LeaveLanding() {
 int Playback::GetPosition(long* position) {
   if (IsAtEnd()) return GetDuration(position);
   FilmTime time = 0;
-  if (const int error = pipeline_.GetPosition(&time)) return error;
-  if (landed_) time = landed_->time;
+  if (const int error = FindTime(&time)) return error;
   *position = ToMilliseconds(std::max<FilmTime>(0, time - film_.GetOrigin()));
+  return PLAYER_ERROR_NONE;
+}
+
+int Playback::FindTime(FilmTime* time) const {
+  if (const int error = pipeline_.GetPosition(time)) return error;
+  if (landed_) *time = landed_->time;
   return PLAYER_ERROR_NONE;
 }
 

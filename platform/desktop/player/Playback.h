@@ -40,7 +40,7 @@ class Playback {
   bool IsAtEnd() const { return pipeline_.HasEnded(); }
 
   /// A player that plays goes on playing from where it lands. To a key frame, that is the last one
-  /// at or before the position, or the first one of all.
+  /// at or before the position, or the first one of all. A seek that fails leaves it where it was.
   int Seek(long position, bool exact);
 
   int GetPosition(long* position);
@@ -57,6 +57,8 @@ class Playback {
  private:
   int CheckSeek(long position);
   int Land(long position, bool exact);
+  void GoBack(FilmTime time);
+  int FindTime(FilmTime* time) const;
   int LeaveLanding();
   int Rewind();
 

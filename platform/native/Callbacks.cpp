@@ -86,8 +86,14 @@ bool SetCallback(Kind kind, Callback callback, void* userData) {
   Slot& slot = TheSlots().Of(kind);
   slot.callback = callback;
   slot.userData = userData;
-  TheSlots().Register(slot);
+  slot.registration = 0;
   return true;
+}
+
+void BeginReports(Kind kind) {
+  const auto lock = TheWorker().Acquire();
+  Slot& slot = TheSlots().Of(kind);
+  if (slot.callback != nullptr) TheSlots().Register(slot);  // it may have been removed meanwhile
 }
 
 void UnsetCallback(Kind kind) {

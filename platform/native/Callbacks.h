@@ -17,7 +17,7 @@ struct Report {
 /// Of a type that belongs to the kind.
 using Callback = void (*)();
 
-/// Sets the callback for reports of a kind, those from now on. Throws `std::bad_alloc` or
+/// Sets the callback for reports of a kind, those from `BeginReports` on. Throws `std::bad_alloc` or
 /// `std::system_error`.
 /// \return false when nothing is told any more: in a forked child, and when the process is ending
 bool SetCallback(Kind kind, Callback callback, void* userData);

@@ -15,6 +15,9 @@ void ReportMuteAll(bool isMuted);
 void ReportInterruption(int code);
 /// @}
 
+/// From now on, reports of a kind are for the callback that was set last.
+void BeginReports(Kind kind);
+
 /// The session's settings, which native/ keeps.
 struct Session {
   int type = 0;

@@ -21,8 +21,9 @@ int GetMuteAll(bool& isMuted);
 /// The session has changed; `Native::GetSession` tells what it is now.
 void OnSessionChanged();
 
-/// The program listens, or has stopped to listen, to reports of a kind.
-void OnListening(Native::Kind kind, bool isListening);
+/// The program has set a callback for reports of a kind. The device calls `Native::BeginReports`
+/// once it knows how things are: what had changed before isn't told.
+void OnListening(Native::Kind kind);
 
 /// Returns when what has happened outside before has been reported, in bounded time.
 void AwaitReports();

@@ -36,7 +36,7 @@ int SetCallback(std::optional<int> failure, Kind kind, Function callback, void* 
     if (!Native::SetCallback(kind, reinterpret_cast<Native::Callback>(callback), userData)) {
       return int{SOUND_MANAGER_ERROR_NO_CONNECTION};
     }
-    SoundDevice::OnListening(kind, true);
+    SoundDevice::OnListening(kind);
     return kOk;
   });
 }
@@ -44,7 +44,6 @@ int SetCallback(std::optional<int> failure, Kind kind, Function callback, void* 
 int UnsetCallback(std::optional<int> failure, Kind kind) {
   return Contain(failure, true, [&] {
     Native::UnsetCallback(kind);
-    SoundDevice::OnListening(kind, false);
     return kOk;
   });
 }

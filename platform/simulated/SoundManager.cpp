@@ -94,7 +94,7 @@ int GetMuteAll(bool& isMuted) {
 
 void OnSessionChanged() {}
 
-void OnListening(Native::Kind, bool) {}
+void OnListening(Native::Kind kind) { Native::BeginReports(kind); }
 
 void AwaitReports() {}
 

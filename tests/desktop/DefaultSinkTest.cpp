@@ -46,16 +46,16 @@ TEST(Headphones, DisruptWhenTheyAreUnpluggedAndOnlyThen) {
       {"left for the speaker, having been unplugged before", kNo, kNo, true, false},
       {"not watched", kUnknown, kUnknown, false, false},
   };
-  Reports reports;
   for (const auto& row : rows) {
     std::vector<int> codes;
     const Streams streams;
-    DefaultSink defaultSink(reports, streams);
+    DefaultSink defaultSink(streams);
     const sound_manager_session_interrupted_cb callback = [](int code, void* data) {
       static_cast<std::vector<int>*>(data)->push_back(code);
     };
     Native::SetCallback(Native::Kind::kInterruption, reinterpret_cast<Native::Callback>(callback),
                         &codes);
+    Native::BeginReports(Native::Kind::kInterruption);
     Tell(defaultSink, row.before, false);
     for (int i = 0; i < 2; ++i) Tell(defaultSink, row.after, row.goesToSpeaker);
     Native::WaitUntilReported();

@@ -1,5 +1,7 @@
 #include "Interruptions.h"
 
+#include "Reports.h"
+
 #include <utility>
 
 namespace Desktop {
@@ -20,9 +22,9 @@ void DefaultSink::Put(const pa_sink_info& info) {
   if (Is(info.index)) {
     // A sink that is idle may be suspended by the server itself; one that plays only by a program.
     if (WasUnplugged(info)) {
-      reports_.ReportInterruption(kOutputGone);
+      Tell(Native::ReportInterruption, kOutputGone);
     } else if (isSuspended && !sink_->isSuspended && streams_.IsPlayerHeardOn(info.index)) {
-      reports_.ReportInterruption(kTakenOver);
+      Tell(Native::ReportInterruption, kTakenOver);
     }
   }
   const std::string port = info.active_port != nullptr ? info.active_port->name : "";
@@ -40,7 +42,7 @@ bool DefaultSink::WasUnplugged(const pa_sink_info& info) const {
 void DefaultSink::OnRemoved() {
   removed_ = std::exchange(last_, {});
   sink_.reset();
-  reports_.ReportInterruption(kOutputGone);
+  Tell(Native::ReportInterruption, kOutputGone);
 }
 
 void DefaultSink::OnServerLost() {
@@ -52,7 +54,7 @@ void DefaultSink::OnServerLost() {
 void DefaultSink::OnMuted(bool isMuted) {
   const bool changed = isMuted_ && *isMuted_ != isMuted;
   isMuted_ = isMuted;
-  if (changed) reports_.ReportMuteAll(isMuted);
+  if (changed) Tell(Native::ReportMuteAll, isMuted);
 }
 
 bool Interruptions::Update() {
@@ -60,7 +62,7 @@ bool Interruptions::Update() {
   const bool isInterrupted = isCall || streams_.IsHeardFromOthers(kAlarm);
   if (isInterrupted && started_ == kFinished) {
     started_ = isCall ? kCallStarted : kAlarmStarted;
-    reports_.ReportInterruption(started_);
+    Tell(Native::ReportInterruption, started_);
   }
   return (!isInterrupted && started_ != kFinished) || !killed_.empty();
 }
@@ -68,21 +70,21 @@ bool Interruptions::Update() {
 void Interruptions::Settle() {
   for (const auto& [stream, sink] : std::exchange(killed_, {})) {
     if (streams_.Has(stream) || defaultSink_.WasRemoved(sink)) continue;
-    reports_.ReportInterruption(kTakenOver);
+    Tell(Native::ReportInterruption, kTakenOver);
   }
   if (!Update()) return;
   started_ = kFinished;
-  reports_.ReportInterruption(kFinished);
+  Tell(Native::ReportInterruption, kFinished);
 }
 
 void Interruptions::OnServerLost() {
   started_ = kFinished;
   killed_.clear();
-  reports_.ReportInterruption(kServerLost);
+  Tell(Native::ReportInterruption, kServerLost);
 }
 
 void Interruptions::Repeat() const {
-  if (started_ != kFinished) reports_.ReportInterruption(started_);
+  if (started_ != kFinished) Tell(Native::ReportInterruption, started_);
 }
 
 }  // namespace Desktop

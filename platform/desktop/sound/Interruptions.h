@@ -4,7 +4,6 @@
 #pragma once
 
 #include "Pulse.h"
-#include "Reports.h"
 #include "Streams.h"
 
 #include <optional>
@@ -29,8 +28,7 @@ class DefaultSink {
   /// The server's name for the sink that is the default.
   static constexpr char kName[] = "@DEFAULT_SINK@";
 
-  DefaultSink(const Reports& reports, const Streams& streams)
-      : reports_(reports), streams_(streams) {}
+  explicit DefaultSink(const Streams& streams) : streams_(streams) {}
 
   bool Exists() const { return sink_.has_value(); }
   bool Is(std::uint32_t sink) const { return sink_ && sink_->index == sink; }
@@ -65,7 +63,6 @@ class DefaultSink {
 
   bool WasUnplugged(const pa_sink_info& info) const;
 
-  const Reports& reports_;
   const Streams& streams_;
   std::optional<Sink> sink_;
   std::optional<std::uint32_t> last_;  // until it is told as gone
@@ -81,8 +78,8 @@ class DefaultSink {
 /// its streams along, which is one event and not two.
 class Interruptions {
  public:
-  Interruptions(const Reports& reports, const Streams& streams, const DefaultSink& defaultSink)
-      : reports_(reports), streams_(streams), defaultSink_(defaultSink) {}
+  Interruptions(const Streams& streams, const DefaultSink& defaultSink)
+      : streams_(streams), defaultSink_(defaultSink) {}
 
   /// Compares with the streams that are there now. \return whether something seems to have ended
   bool Update();
@@ -105,7 +102,6 @@ class Interruptions {
     std::uint32_t sink;
   };
 
-  const Reports& reports_;
   const Streams& streams_;
   const DefaultSink& defaultSink_;
   int started_ = kFinished;  // the code it started with

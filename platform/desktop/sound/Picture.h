@@ -4,7 +4,6 @@
 #include "Calls.h"
 #include "Connection.h"
 #include "Interruptions.h"
-#include "Reports.h"
 #include "Streams.h"
 #include "Volumes.h"
 
@@ -19,7 +18,6 @@ class Picture final : public Connection::Owner, private Calls::Owner {
 
   /// \name What the picture shows
   /// @{
-  Reports& GetReports() { return reports_; }
   Volumes& GetVolumes() { return volumes_; }
   DefaultSink& GetDefaultSink() { return defaultSink_; }
   Interruptions& GetInterruptions() { return interruptions_; }
@@ -77,11 +75,10 @@ class Picture final : public Connection::Owner, private Calls::Owner {
   /// @}
 
   Connection& connection_;
-  Reports reports_;
   Streams streams_;
-  Volumes volumes_{reports_, streams_};
-  DefaultSink defaultSink_{reports_, streams_};
-  Interruptions interruptions_{reports_, streams_, defaultSink_};
+  Volumes volumes_{streams_};
+  DefaultSink defaultSink_{streams_};
+  Interruptions interruptions_{streams_, defaultSink_};
   Calls calls_{connection_, *this};
   bool isPipeWire_ = false;
   bool isComplete_ = false;      // all of the server has been seen since it was connected

@@ -169,14 +169,11 @@ int SoundDevice::SetMuteAll(bool muted) {
 
 void SoundDevice::OnSessionChanged() {}  // a player looks at the session with each buffer of sound
 
-/// The callback is told of changes from the present state on, if there is a server.
-void SoundDevice::OnListening(Native::Kind kind, bool listening) {
-  if (!listening) return;
+/// The callback is told of changes from the present state on; without a server, from its coming on.
+void SoundDevice::OnListening(Native::Kind kind) {
   OnDevice([=](Device& device, Lock& lock, Time limit) -> int {
-    Desktop::Reports& reports = device.picture.GetReports();
-    reports.Silence(kind);
     const int error = device.picture.Refresh(lock, limit);
-    reports.EndSilence(kind);
+    Native::BeginReports(kind);
     if (kind == Native::Kind::kInterruption) device.picture.GetInterruptions().Repeat();
     return error;
   });

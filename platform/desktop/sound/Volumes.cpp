@@ -1,5 +1,7 @@
 #include "Volumes.h"
 
+#include "Reports.h"
+
 #include <algorithm>
 #include <cstring>
 #include <utility>
@@ -59,7 +61,7 @@ void Volumes::OnStreamMoved(const Stream& stream) {
 
 void Volumes::Change(Category category, int level) {
   const std::optional<int> before = std::exchange(levels_[ToIndex(category)], level);
-  if (before && *before != level) reports_.ReportLevel(category, level);
+  if (before && *before != level) Tell(Native::ReportLevel, category, level);
 }
 
 std::vector<std::uint32_t> Volumes::Send(pa_context* context, Category category, int level,

@@ -3,7 +3,6 @@
 
 #include "Batch.h"
 #include "Categories.h"
-#include "Reports.h"
 #include "Streams.h"
 
 #include <array>
@@ -20,7 +19,7 @@ namespace Desktop {
 /// change, and what this process itself sets is known from its answer on: no change is told twice.
 class Volumes {
  public:
-  Volumes(const Reports& reports, Streams& streams) : reports_(reports), streams_(streams) {}
+  explicit Volumes(Streams& streams) : streams_(streams) {}
 
   /// There is a new connection: what it tells first isn't a change of anything.
   void Begin();
@@ -73,7 +72,6 @@ class Volumes {
   void PutLevelsAtStart();
   void Change(Category category, int level);
 
-  const Reports& reports_;
   Streams& streams_;
   bool isBeginning_ = true;
   bool areStored_ = false;

@@ -2,8 +2,9 @@
 /// Native player interface.
 ///
 /// Every function returns 0 (`PLAYER_ERROR_NONE`) or one of the error codes below, and logs its
-/// failures. Positions and lengths are in milliseconds. A player may be used by several threads;
-/// its functions run one after the other, except `player_destroy`, which must be the last.
+/// failures; where the library logs them itself (seeking, effects) only the reason, at level debug.
+/// Positions and lengths are in milliseconds. A player may be used by several threads; its
+/// functions run one after the other, except `player_destroy`, which must be the last.
 #pragma once
 
 #ifdef __cplusplus

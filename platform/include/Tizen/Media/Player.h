@@ -41,15 +41,16 @@ class Player : public Tizen::Base::Object {
   /// Opens a file, replacing the one that is open, and pauses on its first frame.
   /// \param path the file's path, in the file system's encoding
   /// \return `E_SUCCESS`; `E_INVALID_ARG` for a null or empty path or a file that isn't playable
-  /// media; `E_OBJ_NOT_FOUND` when there is no such file; `E_SYSTEM` when it can't be read or the
-  /// media framework fails. After a failure no file is open.
+  /// media; `E_OBJ_NOT_FOUND` when there is no such file; `E_OUT_OF_MEMORY`; `E_SYSTEM` when it
+  /// can't be read or the media framework fails. After a failure no file is open.
   result OpenFile(const char* path);
 
   /// Closes the file. \return `E_SUCCESS`, also when no file is open
   result Close();
 
   /// Starts or resumes playing; at the end of the file, from its start again.
-  /// \return `E_SUCCESS`, `E_INVALID_STATE` when no file is open, `E_SYSTEM`
+  /// \return `E_SUCCESS`, `E_INVALID_STATE` when no file is open, `E_INVALID_OPERATION` when a file
+  /// that can't be sought in would have to start over, `E_SYSTEM`
   result Play();
 
   /// Pauses at the current position.
@@ -65,6 +66,7 @@ class Player : public Tizen::Base::Object {
   /// `E_SYSTEM`
   long GetPosition() const;
 
+  /// The first time, a file whose container doesn't tell may be read for it, for some seconds.
   /// \return the length in milliseconds, or -1: `E_INVALID_STATE` when no file is open, else
   /// `E_SYSTEM`
   long GetDuration() const;

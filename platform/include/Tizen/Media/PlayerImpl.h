@@ -29,7 +29,8 @@ class _PlayerImpl : public Tizen::Base::Object {
   /// \return `E_SUCCESS`; `E_INVALID_STATE` when no file is open; `E_INVALID_ARG` for a position
   /// outside the file; `E_INVALID_OPERATION` when the file has no video or can't be sought in;
   /// `E_OUT_OF_MEMORY`; `E_SYSTEM` when there is no intact key frame, or the media framework fails
-  /// or doesn't answer in time. Failures are logged; success leaves the last result alone.
+  /// or doesn't answer in time. A failure is the caller's to log, only its reason is logged, at
+  /// level debug; success leaves the last result alone.
   result SeekTo(long msTime, bool exact);
 
   /// The native player; null before `Construct`.

@@ -145,14 +145,12 @@ class KeyFramesTest : public PlayerOnMedia {
     std::vector<long> listed;
     ASSERT_EQ(player.GetKeyFrames(listed), E_SUCCESS);
     ASSERT_GE(listed.size(), keyFrames.size());
-    EXPECT_LE(listed.size(), keyFrames.size() + 1);
     for (std::size_t i = 0; i < keyFrames.size(); ++i) EXPECT_TRUE(Is(i, listed[i])) << listed[i];
   }
 
   void ExpectPlaysOnFrom(std::size_t keyFrame) {
     SCOPED_TRACE("plays on from " + std::to_string(keyFrames[keyFrame]));
     ASSERT_EQ(seeker.SeekTo(keyFrames[keyFrame] + 90), E_SUCCESS);
-    EXPECT_TRUE(player.IsKeyFrame());
     const auto picture = Capture();
     ASSERT_EQ(player.Play(), E_SUCCESS);
     ExpectPlaying(keyFrames[keyFrame] - 25);

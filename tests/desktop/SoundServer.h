@@ -17,8 +17,6 @@ class Program {
   Program(Program&& other) noexcept;
   Program& operator=(Program&&) = delete;
 
-  pid_t GetId() const { return process_; }
-
   /// Sends a signal.
   void Signal(int signal) const;
 

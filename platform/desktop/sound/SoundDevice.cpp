@@ -81,7 +81,7 @@ int OnDevice(Operation operation) {
 /// What another thread sets meanwhile, as a callback may, is told in its place.
 template <typename Refresh, typename Condition>
 int AwaitReadBack(Device& device, Lock& lock, Time limit, Refresh refresh, Condition isTold) {
-  while (device.picture.IsOfPipeWire()) {
+  while (device.picture.GetState().isPipeWire) {
     if (const int error = refresh()) return error;
     if (isTold()) break;
     if (Connection::Clock::now() > limit) return kTimedOut;
@@ -108,7 +108,7 @@ int SoundDevice::GetMaxLevel(int, int& max) {
 int SoundDevice::GetLevel(int type, int& level) {
   return OnDevice([&](Device& device, Lock& lock, Time limit) -> int {
     if (const int error = device.picture.Refresh(lock, limit)) return error;
-    const Desktop::Volumes& volumes = device.picture.GetVolumes();
+    const Desktop::Volumes& volumes = device.picture.GetState().volumes;
     if (!volumes.AreStored()) return SOUND_MANAGER_ERROR_INVALID_OPERATION;
     level = volumes.GetLevel(type);
     return SOUND_MANAGER_ERROR_NONE;
@@ -118,7 +118,7 @@ int SoundDevice::GetLevel(int type, int& level) {
 int SoundDevice::SetLevel(int type, int level) {
   return OnDevice([=](Device& device, Lock& lock, Time limit) -> int {
     Picture& picture = device.picture;
-    Desktop::Volumes& volumes = picture.GetVolumes();
+    Desktop::Volumes& volumes = picture.GetState().volumes;
     const auto refresh = [&] { return picture.Refresh(lock, limit); };
     // So that what another program changed before is reported first; and a stored volume can only
     // be written with its other fields.
@@ -127,7 +127,8 @@ int SoundDevice::SetLevel(int type, int level) {
     const unsigned number = ++device.sets[static_cast<std::size_t>(type)];
     Batch batch(device.connection);
     const auto streams = volumes.Send(device.connection.GetContext(), type, level, batch);
-    if (!picture.IsOfPipeWire()) batch.WhenDone([&] { volumes.OnDone(type, level, streams); });
+    if (!picture.GetState().isPipeWire)
+      batch.WhenDone([&] { volumes.OnDone(type, level, streams); });
     if (const int error = batch.Await(lock, limit)) return error;
     return AwaitReadBack(device, lock, limit, refresh, [&] {
       const bool isOvertaken = device.sets[static_cast<std::size_t>(type)] != number;
@@ -139,7 +140,7 @@ int SoundDevice::SetLevel(int type, int level) {
 int SoundDevice::GetMuteAll(bool& muted) {
   return OnDevice([&](Device& device, Lock& lock, Time limit) -> int {
     if (const int error = device.picture.Refresh(lock, limit)) return error;
-    const Desktop::DefaultSink& defaultSink = device.picture.GetDefaultSink();
+    const Desktop::DefaultSink& defaultSink = device.picture.GetState().defaultSink;
     if (!defaultSink.Exists()) return SOUND_MANAGER_ERROR_INVALID_OPERATION;
     muted = defaultSink.IsMuted();
     return SOUND_MANAGER_ERROR_NONE;
@@ -149,7 +150,7 @@ int SoundDevice::GetMuteAll(bool& muted) {
 int SoundDevice::SetMuteAll(bool muted) {
   return OnDevice([=](Device& device, Lock& lock, Time limit) -> int {
     Picture& picture = device.picture;
-    Desktop::DefaultSink& defaultSink = picture.GetDefaultSink();
+    Desktop::DefaultSink& defaultSink = picture.GetState().defaultSink;
     const auto refresh = [&] { return picture.Refresh(lock, limit); };
     // So that what another program changed before is reported first.
     if (const int error = refresh()) return error;
@@ -159,7 +160,7 @@ int SoundDevice::SetMuteAll(bool muted) {
       return pa_context_set_sink_mute_by_name(device.connection.GetContext(),
                                               Desktop::DefaultSink::kName, muted, onAnswer, data);
     });
-    if (!picture.IsOfPipeWire()) batch.WhenDone([&] { defaultSink.OnMuted(muted); });
+    if (!picture.GetState().isPipeWire) batch.WhenDone([&] { defaultSink.OnMuted(muted); });
     if (const int error = batch.Await(lock, limit)) return error;
     return AwaitReadBack(device, lock, limit, refresh, [&] {
       return device.sets.back() != number || defaultSink.IsMuted() == muted;
@@ -174,7 +175,7 @@ void SoundDevice::OnListening(Native::Kind kind) {
   OnDevice([=](Device& device, Lock& lock, Time limit) -> int {
     const int error = device.picture.Refresh(lock, limit);
     Native::BeginReports(kind);
-    if (kind == Native::Kind::kInterruption) device.picture.GetInterruptions().Repeat();
+    if (kind == Native::Kind::kInterruption) device.picture.GetState().interruptions.Repeat();
     return error;
   });
 }

@@ -52,7 +52,7 @@ if(ZELKORA_TOOLS)
   zelkora_package(tools zelkora-media-tools sound "${runtime} ${same}, ${devices}"
     "media extensions: the command-line program\nThe program zelkora, and zelkora-on, which runs any program on a device.")
 endif()
-zelkora_package(runtime ${runtime} libs "${system}zelkora-media-desktop | zelkora-media-simulated"
+zelkora_package(runtime ${runtime} libs "${system}${desktop} | ${simulated}"
   "media extensions: the library\nEffects, sessions, volumes, calls and key-frame seek for native applications.")
 zelkora_package(development libzelkora-media-dev libdevel "${runtime} ${same}, ${devices}"
   "media extensions: headers, and what CMake and pkg-config need\nFor programs that use the library, and for their tests.")

@@ -17,8 +17,8 @@ struct Report {
 /// Of a type that belongs to the kind.
 using Callback = void (*)();
 
-/// Sets the callback for reports of a kind, those from `BeginReports` on. Throws `std::bad_alloc` or
-/// `std::system_error`.
+/// Sets the callback for reports of a kind, those from `BeginReports` on. Throws `std::bad_alloc`
+/// or `std::system_error`.
 /// \return false when nothing is told any more: in a forked child, and when the process is ending
 bool SetCallback(Kind kind, Callback callback, void* userData);
 

@@ -150,9 +150,9 @@ int Playback::GetPosition(long* position) {
 }
 
 int Playback::FindTime(FilmTime* time) const {
-  if (const int error = pipeline_.GetPosition(time)) return error;
-  if (landed_) *time = landed_->time;
-  return PLAYER_ERROR_NONE;
+  if (!landed_) return pipeline_.GetPosition(time);
+  *time = landed_->time;
+  return pipeline_.Check();
 }
 
 int Playback::GetDuration(long* duration) {

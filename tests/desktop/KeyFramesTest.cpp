@@ -151,6 +151,7 @@ class KeyFramesTest : public PlayerOnMedia {
   void ExpectPlaysOnFrom(std::size_t keyFrame) {
     SCOPED_TRACE("plays on from " + std::to_string(keyFrames[keyFrame]));
     ASSERT_EQ(seeker.SeekTo(keyFrames[keyFrame] + 90), E_SUCCESS);
+    EXPECT_TRUE(player.IsKeyFrame());
     const auto picture = Capture();
     ASSERT_EQ(player.Play(), E_SUCCESS);
     ExpectPlaying(keyFrames[keyFrame] - 25);

@@ -18,12 +18,11 @@ namespace Host {
 
 /// A thread that delivers what others post, in order.
 ///
-/// Two locks, so that posting and delivering seldom meet: one guards the queue, the other the batch
-/// that is being delivered and what its owner keeps beside it. Where both are needed the batch's is
-/// taken first. There is one worker for a type of items; it is never destroyed.
+/// One lock guards the queue, what is being delivered, and what its owner keeps beside it; it is
+/// released while others are called. There is one worker for a type of items; it is never destroyed.
 ///
-/// A forked child has no thread, and locks may be held for ever: there `IsForked` comes before all
-/// else.
+/// A forked child has no thread, and the lock may be held for ever: there `IsForked` comes before
+/// all else.
 template <typename Item>
 class Worker {
  public:
@@ -45,11 +44,11 @@ class Worker {
   /// Throws `std::bad_alloc`, with \p item as it was. \return false when the process is ending
   bool Post(Item&& item);
 
-  /// \return the batch's lock, held
+  /// \return the lock, held
   Lock Acquire() { return Lock(mutex_); }
 
-  /// \return the number of the next item to be posted
-  std::uint64_t CountPosted();
+  /// \return the number of the next item to be posted; the lock must be held.
+  std::uint64_t CountPosted() const { return posted_; }
 
   /// \return the number of the item that is being delivered; the lock must be held.
   std::uint64_t CountFinished() const { return finished_; }
@@ -76,7 +75,7 @@ class Worker {
  private:
   void Stop();
   void Run();
-  bool WaitForItems();
+  bool TakeBatch(Lock& lock);
   void NotifyProgress();
 
   static inline Worker* instance_ = nullptr;
@@ -86,26 +85,24 @@ class Worker {
   std::atomic<std::thread::id> id_{};  // also after the thread was detached
   std::thread thread_;
 
-  alignas(64) std::mutex queueMutex_;
-  std::condition_variable queued_;
-  std::vector<Item> queue_;
-  std::uint64_t posted_ = 0;
-  bool isSleeping_ = false;  // the thread waits for items and must be woken
-  bool isStopped_ = false;   // written with both locks
-
-  alignas(64) std::mutex mutex_;
+  std::mutex mutex_;
+  std::condition_variable posting_;
   std::condition_variable progressed_;
-  std::vector<Item> batch_;
+  std::vector<Item> queue_;
+  std::vector<Item> batch_;  // taken from the queue; what was delivered of it is empty
+  std::uint64_t posted_ = 0;
   std::uint64_t finished_ = 0;
   const void* calling_ = nullptr;
   int waiting_ = 0;                     // threads that wait for the end of a delivery or a call
   std::uint64_t awaited_ = UINT64_MAX;  // the lowest number of finished items that is waited for
+  bool isSleeping_ = false;             // the thread waits for items and must be woken
+  bool isStopped_ = false;
 };
 
 template <typename Item>
 bool Worker<Item>::Start() {
   if (IsForked()) return false;
-  std::lock_guard lock(queueMutex_);
+  const Lock lock(mutex_);
   if (isStopped_) return false;
   if (thread_.joinable()) return true;
   // Exit handlers run in reverse order: those that delete what is delivered to come later, and so
@@ -122,10 +119,9 @@ void Worker<Item>::Stop() {
   if (IsForked()) return;  // a child that ends: the thread stayed with the parent
   {
     const Lock lock(mutex_);
-    std::lock_guard queueLock(queueMutex_);
     isStopped_ = true;
   }
-  queued_.notify_one();
+  posting_.notify_one();
   if (!thread_.joinable()) return;
   if (IsOnThread()) {
     thread_.detach();  // whoever is called ends the process: the call never returns
@@ -138,27 +134,20 @@ void Worker<Item>::Stop() {
 template <typename Item>
 bool Worker<Item>::Post(Item&& item) {
   if (IsForked()) return false;
-  Lock lock(queueMutex_);
+  Lock lock(mutex_);
   if (isStopped_) return false;
   queue_.push_back(std::move(item));
   ++posted_;
   const bool wake = std::exchange(isSleeping_, false);
   lock.unlock();
-  if (wake) queued_.notify_one();
+  if (wake) posting_.notify_one();
   return true;
-}
-
-template <typename Item>
-std::uint64_t Worker<Item>::CountPosted() {
-  std::lock_guard lock(queueMutex_);
-  return posted_;
 }
 
 template <typename Item>
 template <typename Function>
 void Worker<Item>::ForEachPending(Function visit) {
   for (Item& item : batch_) visit(item);
-  std::lock_guard lock(queueMutex_);
   for (Item& item : queue_) visit(item);
 }
 
@@ -191,8 +180,8 @@ void Worker<Item>::NotifyProgress() {
 template <typename Item>
 void Worker<Item>::WaitUntilDelivered() {
   if (IsForked() || IsOnThread()) return;
-  const std::uint64_t posted = CountPosted();
   Lock lock(mutex_);
+  const std::uint64_t posted = posted_;
   while (finished_ < posted && !isStopped_) {
     awaited_ = std::min(awaited_, posted);
     progressed_.wait(lock);
@@ -202,34 +191,29 @@ void Worker<Item>::WaitUntilDelivered() {
 template <typename Item>
 void Worker<Item>::Run() {
   id_ = std::this_thread::get_id();
-  while (WaitForItems()) {
-    Lock lock(mutex_);
-    {
-      std::lock_guard queueLock(queueMutex_);
-      batch_.swap(queue_);
-    }
+  std::vector<Item> dropped[2];  // freed without the lock
+  Lock lock(mutex_);
+  while (TakeBatch(lock)) {
     for (std::size_t i = 0; i < batch_.size() && !isStopped_; ++i) {
       deliver_(batch_[i], lock);
       if (++finished_ >= awaited_ || waiting_ > 0) NotifyProgress();
     }
-    if (!isStopped_) batch_.clear();
   }
-  std::vector<Item> dropped[2];
-  const Lock lock(mutex_);
-  std::lock_guard queueLock(queueMutex_);
   dropped[0].swap(batch_);
   dropped[1].swap(queue_);
 }
 
 /// \return false when the process is ending
 template <typename Item>
-bool Worker<Item>::WaitForItems() {
-  Lock lock(queueMutex_);
+bool Worker<Item>::TakeBatch(Lock& lock) {
+  if (isStopped_) return false;
+  batch_.clear();
   while (queue_.empty() && !isStopped_) {
     isSleeping_ = true;
-    queued_.wait(lock);
+    posting_.wait(lock);
   }
   isSleeping_ = false;
+  batch_.swap(queue_);
   return !isStopped_;
 }
 

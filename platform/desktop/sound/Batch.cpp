@@ -4,7 +4,8 @@ namespace Desktop {
 
 Batch::~Batch() {
   for (const OperationPtr& operation : operations_) {
-    if (pa_operation_get_state(operation.get()) == PA_OPERATION_RUNNING) {
+    const bool isSent = operation != nullptr;
+    if (isSent && pa_operation_get_state(operation.get()) == PA_OPERATION_RUNNING) {
       pa_operation_cancel(operation.get());
     }
   }
@@ -13,16 +14,6 @@ Batch::~Batch() {
 int Batch::Await(Connection::Lock& lock, Connection::Time limit) {
   const int error = connection_.Await(lock, limit, [this] { return outstanding_ == 0; });
   return error != SOUND_MANAGER_ERROR_NONE ? error : ToErrorCode(error_);
-}
-
-void Batch::Keep(pa_operation* operation) {
-  if (operation == nullptr) {
-    error_ = PA_ERR_BADSTATE;
-    return;
-  }
-  OperationPtr owned(operation);
-  operations_.push_back(std::move(owned));
-  ++outstanding_;
 }
 
 void Batch::OnAnswer(pa_context* context, int success, void* self) {

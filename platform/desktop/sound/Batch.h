@@ -22,19 +22,19 @@ class Batch {
   /// Adds the request that \p send makes with the callback and user data it is given.
   template <typename Send>
   void Add(Send send) {
-    Keep(send(OnAnswer, this));
+    Add(send, OnAnswer);
   }
 
   /// The same for a request of a stream.
   template <typename Send>
   void AddOfStream(Send send) {
-    Keep(send(OnStreamAnswer, this));
+    Add(send, OnStreamAnswer);
   }
 
   /// The same for a request that may be refused: what it is about may be gone.
   template <typename Send>
   void AddOptional(Send send) {
-    Keep(send(OnOptionalAnswer, this));
+    Add(send, OnOptionalAnswer);
   }
 
   /// Has \p onSuccess called on the connection's thread with the last answer, if no request was
@@ -49,7 +49,18 @@ class Batch {
   static void OnStreamAnswer(pa_stream* stream, int success, void* self);
   static void OnOptionalAnswer(pa_context* context, int success, void* self);
 
-  void Keep(pa_operation* operation);
+  /// What is sent has its place already: nothing can fail between the two.
+  template <typename Send, typename Callback>
+  void Add(Send send, Callback onAnswer) {
+    OperationPtr& operation = operations_.emplace_back();
+    operation.reset(send(onAnswer, this));
+    if (operation == nullptr) {
+      error_ = PA_ERR_BADSTATE;
+    } else {
+      ++outstanding_;
+    }
+  }
+
   void Finish(int error);
 
   Connection& connection_;

@@ -32,6 +32,11 @@ PropertiesPtr DescribeMode(int mode) {
   return properties;
 }
 
+pa_operation* SendMode(pa_stream* stream, int mode, pa_stream_success_cb_t onAnswer, void* data) {
+  return pa_stream_proplist_update(stream, PA_UPDATE_REPLACE, DescribeMode(mode).get(), onAnswer,
+                                   data);
+}
+
 }  // namespace
 
 int Calls::Open(Connection::Lock& lock, Connection::Time limit, int& number) {
@@ -61,10 +66,15 @@ int Calls::SetMode(Connection::Lock& lock, Connection::Time limit, int number, i
     if (Call* call = Find(number)) call->mode = mode;
   });
   batch.AddOfStream([&](pa_stream_success_cb_t onAnswer, void* data) {
-    return pa_stream_proplist_update(Find(number)->stream.get(), PA_UPDATE_REPLACE,
-                                     DescribeMode(mode).get(), onAnswer, data);
+    return SendMode(Find(number)->stream.get(), mode, onAnswer, data);
   });
-  return batch.Await(lock, limit);
+  const int error = batch.Await(lock, limit);
+  const Call* call = Find(number);
+  if (error == kTimedOut && call != nullptr && call->IsOpen()) {
+    // The server may do it later; then it does this next.
+    const OperationPtr undoing(SendMode(call->stream.get(), call->mode, nullptr, nullptr));
+  }
+  return error;
 }
 
 int Calls::GetMode(int number, int& mode) {

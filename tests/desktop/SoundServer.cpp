@@ -210,6 +210,8 @@ void SoundServer::Kill() {
 
 void SoundServer::Signal(int signal) const { processes_.back().Signal(signal); }
 
+void SoundServer::SignalSessionManager(int signal) const { processes_.at(2).Signal(signal); }
+
 std::string Pactl(std::vector<std::string> arguments) {
   arguments.insert(arguments.begin(), "pactl");
   return Output(std::move(arguments));

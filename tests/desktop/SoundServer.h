@@ -69,6 +69,9 @@ class SoundServer {
   /// Sends the server a signal.
   void Signal(int signal) const;
 
+  /// Sends PipeWire's session manager a signal.
+  void SignalSessionManager(int signal) const;
+
  private:
   void StartPipeWire();
 

@@ -12,7 +12,7 @@
 namespace Zelkora::Media {
 namespace {
 
-static_assert(std::size(kSoundCategories) == kSoundTypeCount, "what tests know of");
+static_assert(std::size(kCategories) == kSoundTypeCount, "a category has no name");
 
 template <typename Event>
 struct Dispatch : Event {

@@ -190,8 +190,8 @@ std::vector<Row> Cases(const Page& page) {
         codes = className == "AudioEffector" ? page.playerNumbers : page.soundManagerNumbers;
       row.className = className;
       for (const std::string& pattern : row.operations) {
-        for (const SoundCategory& category : kSoundCategories) {
-          row.operation = Replace(pattern, "*", category.name);
+        for (const Category& category : kCategories) {
+          row.operation = Replace(pattern, "*", NameInOperations(category));
           for (const auto& [code, converted] : codes) {
             row.code = code;
             row.converted = converted;

@@ -56,22 +56,22 @@ using Volumes = ManagerTest<Volume>;
 /// \return what the manager says of all categories
 std::vector<int> Levels(const Volume& manager) {
   std::vector<int> levels;
-  for (const SoundCategory& category : kSoundCategories) {
-    levels.push_back(std::invoke(category.getLevel, manager));
+  for (const Category& category : kCategories) {
+    levels.push_back(std::invoke(category.level, manager));
   }
   return levels;
 }
 
 TEST_F(Volumes, EachCategoryHasARangeAndALevelOfItsOwnWhichTheDeviceJudges) {
   std::vector<int> expected = Levels(manager);
-  for (const SoundCategory& category : kSoundCategories) {
+  for (const Category& category : kCategories) {
     SCOPED_TRACE(category.name);
-    int& own = expected[static_cast<std::size_t>(category.soundType)];
+    int& own = expected[static_cast<std::size_t>(&category - kCategories)];
     int min = 7, max = -1;
     Host::FailCall("sound_manager_get_max_volume", -22, 1);
-    EXPECT_EQ(std::invoke(category.getRange, manager, min, max), E_INVALID_ARG);
+    EXPECT_EQ(std::invoke(category.range, manager, min, max), E_INVALID_ARG);
     EXPECT_EQ(std::pair(min, max), std::pair(0, -1)) << "the minimum is given all the same";
-    EXPECT_EQ(std::invoke(category.getRange, manager, min = 7, max), E_SUCCESS);
+    EXPECT_EQ(std::invoke(category.range, manager, min = 7, max), E_SUCCESS);
     EXPECT_EQ(min, 0);
     EXPECT_GE(max, 10);
     for (own = max; own > 0; --own) {
@@ -103,8 +103,9 @@ TEST_F(Volumes, MutingIsTheDevicesStateAndLeavesTheLevels) {
 
 TEST_F(Volumes, EachChangeReachesEachListenerOnceThroughItsOwnOperation) {
   Added<VolumeListener> first, second;
-  for (const SoundCategory& category : kSoundCategories) {
-    EXPECT_EQ(std::invoke(category.setLevel, manager, 1 + category.soundType), E_SUCCESS);
+  int next = 1;
+  for (const Category& category : kCategories) {
+    EXPECT_EQ(std::invoke(category.setLevel, manager, next++), E_SUCCESS);
   }
   for (int i = 0; i < 2; ++i) EXPECT_EQ(manager.MuteAll(), E_SUCCESS);
   for (int i = 0; i < 2; ++i) EXPECT_EQ(manager.UnmuteAll(), E_SUCCESS);

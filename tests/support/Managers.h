@@ -3,6 +3,7 @@
 #pragma once
 
 #include "LibraryTest.h"
+#include "base/Categories.h"
 
 #include <Zelkora/Media/AudioSessionManager.h>
 #include <Zelkora/Media/AudioVolumeManager.h>
@@ -18,29 +19,7 @@ using Session = AudioSessionManager;
 using Call = VoipAudioSessionManager;
 using Volume = AudioVolumeManager;
 
-/// A sound category of the volume manager.
-struct SoundCategory {
-  std::string name;
-  int soundType;
-  result (Volume::*getRange)(int&, int&) const;
-  result (Volume::*setLevel)(int);
-  int (Volume::*getLevel)() const;
-};
-
-inline const SoundCategory kSoundCategories[] = {
-    {"System", 0, &Volume::GetSystemVolumeRange, &Volume::SetSystemVolumeLevel,
-     &Volume::GetCurrentSystemVolumeLevel},
-    {"Notification", 1, &Volume::GetNotificationVolumeRange, &Volume::SetNotificationVolumeLevel,
-     &Volume::GetCurrentNotificationVolumeLevel},
-    {"Alarm", 2, &Volume::GetAlarmVolumeRange, &Volume::SetAlarmVolumeLevel,
-     &Volume::GetCurrentAlarmVolumeLevel},
-    {"Ringtone", 3, &Volume::GetRingtoneVolumeRange, &Volume::SetRingtoneVolumeLevel,
-     &Volume::GetCurrentRingtoneVolumeLevel},
-    {"Media", 4, &Volume::GetMediaVolumeRange, &Volume::SetMediaVolumeLevel,
-     &Volume::GetCurrentMediaVolumeLevel},
-    {"Call", 5, &Volume::GetCallVolumeRange, &Volume::SetCallVolumeLevel,
-     &Volume::GetCurrentCallVolumeLevel},
-};
+using ::CommandLine::Category, ::CommandLine::kCategories;
 
 /// What a manager is known by, and a use of it that needs nothing.
 template <typename Manager>

@@ -72,6 +72,13 @@ Answer GetInstance() {
   return instance<Manager> = Manager::GetInstance();
 }
 
+/// \return "Media"
+inline std::string NameInOperations(const Category& category) {
+  std::string name = category.name;
+  name[0] = static_cast<char>(std::toupper(name[0]));
+  return name;
+}
+
 inline const std::map<std::string, std::function<Answer()>> kOperations = [] {
   using Effector = AudioEffector;
   const std::string sessions = "AudioSessionManager::", calls = "VoipAudioSessionManager::",
@@ -108,10 +115,11 @@ inline const std::map<std::string, std::function<Answer()>> kOperations = [] {
       {"VideoKeyFrameSeeker::Construct", [] { return seeker->Construct(*player); }},
       {"VideoKeyFrameSeeker::SeekTo", On(seeker, &VideoKeyFrameSeeker::SeekTo, position)},
   };
-  for (const auto& [name, soundType, getRange, setLevel, getLevel] : kSoundCategories) {
-    all[volumes + "Get" + name + "VolumeRange"] = On(instance<Volume>, getRange, low, high);
-    all[volumes + "Set" + name + "VolumeLevel"] = On(instance<Volume>, setLevel, level);
-    all[volumes + "GetCurrent" + name + "VolumeLevel"] = On(instance<Volume>, getLevel);
+  for (const Category& of : kCategories) {
+    const std::string name = NameInOperations(of);
+    all[volumes + "Get" + name + "VolumeRange"] = On(instance<Volume>, of.range, low, high);
+    all[volumes + "Set" + name + "VolumeLevel"] = On(instance<Volume>, of.setLevel, level);
+    all[volumes + "GetCurrent" + name + "VolumeLevel"] = On(instance<Volume>, of.level);
   }
   return all;
 }();

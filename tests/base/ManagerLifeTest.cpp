@@ -37,6 +37,11 @@ constexpr char kEndOfSession[] = "sound_manager_unset_session_interrupted_cb()";
 constexpr char kEndOfLevels[] = "sound_manager_unset_volume_changed_cb()";
 constexpr char kEndOfMute[] = "sound_manager_unset_muteall_changed_cb()";
 
+/// Uses of managers that need nothing.
+void Use(Session& manager) { manager.GetMode(); }
+void Use(Call& manager) { manager.GetCallSessionMode(); }
+void Use(Volume& manager) { manager.GetMuteStatus(); }
+
 template <typename Manager>
 class ManagerLife : public LibraryTest {};
 TYPED_TEST_SUITE(ManagerLife, Managers);
@@ -67,7 +72,7 @@ TEST_F(FailedCreation, IsUndoneAndNeverRepeated) {
 
 TYPED_TEST(ManagerLife, IsBegunOnceByTheFirstOfManyThreadsThatPassBothGates) {
   InOwnProcess([this] {
-    Host::SetPrivilege(Facts<TypeParam>::kPrivilege, E_SYSTEM);
+    Host::SetPrivilege(Privilege<TypeParam>(), E_SYSTEM);
     {
       const FailingAllocation failing(0);  // a creation would fail, for ever
       EXPECT_EQ(TypeParam::GetInstance(), nullptr);
@@ -83,7 +88,7 @@ TYPED_TEST(ManagerLife, IsBegunOnceByTheFirstOfManyThreadsThatPassBothGates) {
         while (!open) std::this_thread::yield();
         TypeParam* manager = TypeParam::GetInstance();
         EXPECT_EQ(GetLastResult(), E_SUCCESS);
-        Facts<TypeParam>::Use(*manager);  // whoever has it sees it whole
+        Use(*manager);  // whoever has it sees it whole
         return manager;
       });
     }

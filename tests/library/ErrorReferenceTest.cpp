@@ -95,9 +95,9 @@ void OpenFile() { player->OpenFile("movie"); }
 
 /// The privilege that each class needs; the others are there.
 std::map<std::string, std::string> privileges = {
-    {"AudioSessionManager", Facts<Session>::kPrivilege},
-    {"VoipAudioSessionManager", Facts<Call>::kPrivilege},
-    {"AudioVolumeManager", Facts<Volume>::kPrivilege},
+    {"AudioSessionManager", Privilege<Session>()},
+    {"VoipAudioSessionManager", Privilege<Call>()},
+    {"AudioVolumeManager", Privilege<Volume>()},
 };
 
 const Simulated::Effects kNoEffects{{}, {}}, kUnknownEffect{{2, 6}, {}},
@@ -161,7 +161,7 @@ const std::map<std::string, std::function<void(const Row&)>> kChanges = {
     {"an interruption that begins, and `_Event::FireAsync` refuses", [](auto&) { Interrupt(5); }},
     {"a disruption, and `_Event::FireAsync` refuses", [](auto&) { Interrupt(1); }},
     {"a session is open at exit, and `sound_manager_call_session_destroy` refuses",
-     [](auto&) { instance<Call>->EnterCallSession(); }},
+     [](auto&) { call->EnterCallSession(); }},
     {"a change of an unknown sound type", [](auto&) { Change(6); }},
     {"a change without user data",
      [](auto&) { Simulated::ReportWithoutUserData(true), Change(4); }},

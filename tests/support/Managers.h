@@ -21,27 +21,12 @@ using Volume = AudioVolumeManager;
 
 using ::CommandLine::Category, ::CommandLine::kCategories;
 
-/// What a manager is known by, and a use of it that needs nothing.
+/// \return the privilege that a manager needs
 template <typename Manager>
-struct Facts;
-
-template <>
-struct Facts<Session> {
-  static constexpr char kPrivilege[] = "audiomanager.session";
-  static void Use(Session& manager) { manager.GetMode(); }
-};
-
-template <>
-struct Facts<Call> {
-  static constexpr char kPrivilege[] = "audiomanager.voipsession";
-  static void Use(Call& manager) { manager.GetCallSessionMode(); }
-};
-
-template <>
-struct Facts<Volume> {
-  static constexpr char kPrivilege[] = "audiomanager.volume";
-  static void Use(Volume& manager) { manager.GetMuteStatus(); }
-};
+std::string Privilege() {
+  if (std::is_same_v<Manager, Session>) return "audiomanager.session";
+  return std::is_same_v<Manager, Call> ? "audiomanager.voipsession" : "audiomanager.volume";
+}
 
 using Managers = testing::Types<Session, Call, Volume>;
 
@@ -49,7 +34,7 @@ using Managers = testing::Types<Session, Call, Volume>;
 template <typename Manager>
 std::string PrivilegeQuery() {
   return "AccessController::CheckPrivilege(http://developer.zelkora.example/tizen/privilege/" +
-         std::string(Facts<Manager>::kPrivilege) + ")";
+         Privilege<Manager>() + ")";
 }
 inline constexpr char kFeatureQuery[] =
     "SystemInfo::GetValue(http://developer.zelkora.example/tizen/feature/audio_manager)";

@@ -2,7 +2,7 @@
 /// Every public operation of the five classes, by class and name.
 #pragma once
 
-#include "Managers.h"
+#include "managers/Listeners.h"
 
 #include <Tizen/Media/Player.h>
 #include <Zelkora/Media/AudioEffector.h>
@@ -16,16 +16,13 @@ namespace Zelkora::Media {
 
 /// \name What operations are called on and with
 /// @{
-template <typename Manager>
-inline Manager* instance = nullptr;
+inline Session* session = nullptr;
+inline Call* call = nullptr;
+inline Volume* volume = nullptr;
 inline std::optional<Tizen::Media::Player> player;
 inline std::optional<AudioEffector> effector;
 inline std::optional<VideoKeyFrameSeeker> seeker;
-inline struct SilentListener : IAudioSessionEventListener {
-  void OnAudioSessionInterruptStarted() override {}
-  void OnAudioSessionInterruptFinished() override {}
-} silentListener;
-inline IAudioSessionEventListener* const sessionListener = &silentListener;
+inline SessionListener sessionListener;
 inline IAudioVolumeEventListener volumeListener;
 inline AudioSessionMode sessionMode = AUDIO_SESSION_MODE_MEDIA_MIX;
 inline VoipAudioSessionMode callMode = VOIP_AUDIO_SESSION_MODE_MEDIA;
@@ -59,19 +56,6 @@ struct Answer {
   std::int64_t value;
 };
 
-/// \return a call of \p operation on what \p pointer and with what \p arguments hold by then
-template <typename Pointer, typename Function, typename... Arguments>
-std::function<Answer()> On(Pointer& pointer, Function operation, Arguments&... arguments) {
-  return [operation, &pointer, &arguments...] {
-    return std::invoke(operation, *pointer, arguments...);
-  };
-}
-
-template <typename Manager>
-Answer GetInstance() {
-  return instance<Manager> = Manager::GetInstance();
-}
-
 /// \return "Media"
 inline std::string NameInOperations(const Category& category) {
   std::string name = category.name;
@@ -80,46 +64,45 @@ inline std::string NameInOperations(const Category& category) {
 }
 
 inline const std::map<std::string, std::function<Answer()>> kOperations = [] {
-  using Effector = AudioEffector;
   const std::string sessions = "AudioSessionManager::", calls = "VoipAudioSessionManager::",
                     volumes = "AudioVolumeManager::", effectors = "AudioEffector::";
   std::map<std::string, std::function<Answer()>> all = {
-      {sessions + "GetInstance", GetInstance<Session>},
+      {sessions + "GetInstance", [] { return session = Session::GetInstance(); }},
       {sessions + "SetAudioSessionEventListener",
-       On(instance<Session>, &Session::SetAudioSessionEventListener, sessionListener)},
-      {sessions + "SetMode", On(instance<Session>, &Session::SetMode, sessionMode)},
-      {sessions + "GetMode", On(instance<Session>, &Session::GetMode)},
-      {calls + "GetInstance", GetInstance<Call>},
-      {calls + "EnterCallSession", On(instance<Call>, &Call::EnterCallSession)},
-      {calls + "SetCallSessionMode", On(instance<Call>, &Call::SetCallSessionMode, callMode)},
-      {calls + "GetCallSessionMode", On(instance<Call>, &Call::GetCallSessionMode)},
-      {calls + "ExitCallSession", On(instance<Call>, &Call::ExitCallSession)},
-      {volumes + "GetInstance", GetInstance<Volume>},
+       [] { return session->SetAudioSessionEventListener(&sessionListener); }},
+      {sessions + "SetMode", [] { return session->SetMode(sessionMode); }},
+      {sessions + "GetMode", [] { return session->GetMode(); }},
+      {calls + "GetInstance", [] { return call = Call::GetInstance(); }},
+      {calls + "EnterCallSession", [] { return call->EnterCallSession(); }},
+      {calls + "SetCallSessionMode", [] { return call->SetCallSessionMode(callMode); }},
+      {calls + "GetCallSessionMode", [] { return call->GetCallSessionMode(); }},
+      {calls + "ExitCallSession", [] { return call->ExitCallSession(); }},
+      {volumes + "GetInstance", [] { return volume = Volume::GetInstance(); }},
       {volumes + "AddAudioVolumeEventListener",
-       On(instance<Volume>, &Volume::AddAudioVolumeEventListener, volumeListener)},
+       [] { return volume->AddAudioVolumeEventListener(volumeListener); }},
       {volumes + "RemoveAudioVolumeEventListener",
-       On(instance<Volume>, &Volume::RemoveAudioVolumeEventListener, volumeListener)},
-      {volumes + "MuteAll", On(instance<Volume>, &Volume::MuteAll)},
-      {volumes + "UnmuteAll", On(instance<Volume>, &Volume::UnmuteAll)},
-      {volumes + "GetMuteStatus", On(instance<Volume>, &Volume::GetMuteStatus)},
+       [] { return volume->RemoveAudioVolumeEventListener(volumeListener); }},
+      {volumes + "MuteAll", [] { return volume->MuteAll(); }},
+      {volumes + "UnmuteAll", [] { return volume->UnmuteAll(); }},
+      {volumes + "GetMuteStatus", [] { return volume->GetMuteStatus(); }},
       {effectors + "Construct", [] { return effector->Construct(*player); }},
-      {effectors + "GetSupportedEffectListN", On(effector, &Effector::GetSupportedEffectListN)},
+      {effectors + "GetSupportedEffectListN", [] { return effector->GetSupportedEffectListN(); }},
       {effectors + "GetSupportedEffectPresetListN",
-       On(effector, &Effector::GetSupportedEffectPresetListN)},
-      {effectors + "SetEffectLevel", On(effector, &Effector::SetEffectLevel, effect, level)},
-      {effectors + "GetEffectLevel", On(effector, &Effector::GetEffectLevel, effect, low)},
+       [] { return effector->GetSupportedEffectPresetListN(); }},
+      {effectors + "SetEffectLevel", [] { return effector->SetEffectLevel(effect, level); }},
+      {effectors + "GetEffectLevel", [] { return effector->GetEffectLevel(effect, low); }},
       {effectors + "GetEffectLevelRange",
-       On(effector, &Effector::GetEffectLevelRange, effect, low, high)},
-      {effectors + "ResetAllToDefault", On(effector, &Effector::ResetAllToDefault)},
-      {effectors + "SetEffectPreset", On(effector, &Effector::SetEffectPreset, preset)},
+       [] { return effector->GetEffectLevelRange(effect, low, high); }},
+      {effectors + "ResetAllToDefault", [] { return effector->ResetAllToDefault(); }},
+      {effectors + "SetEffectPreset", [] { return effector->SetEffectPreset(preset); }},
       {"VideoKeyFrameSeeker::Construct", [] { return seeker->Construct(*player); }},
-      {"VideoKeyFrameSeeker::SeekTo", On(seeker, &VideoKeyFrameSeeker::SeekTo, position)},
+      {"VideoKeyFrameSeeker::SeekTo", [] { return seeker->SeekTo(position); }},
   };
   for (const Category& of : kCategories) {
     const std::string name = NameInOperations(of);
-    all[volumes + "Get" + name + "VolumeRange"] = On(instance<Volume>, of.range, low, high);
-    all[volumes + "Set" + name + "VolumeLevel"] = On(instance<Volume>, of.setLevel, level);
-    all[volumes + "GetCurrent" + name + "VolumeLevel"] = On(instance<Volume>, of.level);
+    all[volumes + "Get" + name + "VolumeRange"] = [&of] { return (volume->*of.range)(low, high); };
+    all[volumes + "Set" + name + "VolumeLevel"] = [&of] { return (volume->*of.setLevel)(level); };
+    all[volumes + "GetCurrent" + name + "VolumeLevel"] = [&of] { return (volume->*of.level)(); };
   }
   return all;
 }();
@@ -130,9 +113,9 @@ inline void Prepare(const std::string& operation) {
   effector.emplace();
   seeker.emplace();
   if (operation == "GetInstance") return;
-  instance<Session> = Session::GetInstance();
-  instance<Call> = Call::GetInstance();
-  instance<Volume> = Volume::GetInstance();
+  session = Session::GetInstance();
+  call = Call::GetInstance();
+  volume = Volume::GetInstance();
   if (operation == "Construct") return;
   effector->Construct(*player);
   seeker->Construct(*player);
@@ -141,7 +124,7 @@ inline void Prepare(const std::string& operation) {
 /// Makes the state in which an operation succeeds.
 inline void MakeReady(const std::string& operation) {
   const bool isCall = operation.find("CallSession") != operation.npos;
-  if (isCall && operation != "EnterCallSession") instance<Call>->EnterCallSession();
+  if (isCall && operation != "EnterCallSession") call->EnterCallSession();
   if (operation == "SeekTo") player->OpenFile("movie");
   if (operation == "RemoveAudioVolumeEventListener") {
     kOperations.at("AudioVolumeManager::AddAudioVolumeEventListener")();

@@ -10,9 +10,9 @@
 #include <chrono>
 #include <cstdint>
 #include <cstring>
-#include <optional>
 #include <string>
 #include <thread>
+#include <utility>
 
 namespace Desktop {
 namespace {
@@ -26,7 +26,7 @@ constexpr std::chrono::milliseconds kServerLimit{300};
 constexpr std::chrono::milliseconds kWrittenAhead{200};
 
 /// By then a new stream is played.
-constexpr GstClockTime kSilenceAfter = 100 * GST_MSECOND;
+constexpr GstClockTime kSilenceAfter = 500 * GST_MSECOND;
 
 /// Runs one turn of the loop, at most until \p end. \return whether there may be another
 bool RunUntil(pa_mainloop* loop, Clock::time_point end) {
@@ -84,6 +84,16 @@ class ServerVisit {
   std::unique_ptr<pa_context, FreeWith<pa_context_unref>> context_;
   std::unique_ptr<pa_stream, FreeWith<pa_stream_unref>> stream_;
 };
+
+/// Ends a visit some time after, on the thread of GStreamer's clock.
+void EndLater(std::unique_ptr<ServerVisit> visit, GstClockTime after) {
+  const std::unique_ptr<GstClock, FreeWith<gst_object_unref>> clock(gst_system_clock_obtain());
+  const std::unique_ptr<void, FreeWith<gst_clock_id_unref>> timer(
+      gst_clock_new_single_shot_id(clock.get(), gst_clock_get_time(clock.get()) + after));
+  gst_clock_id_wait_async(
+      timer.get(), [](GstClock*, GstClockTime, GstClockID, gpointer) -> gboolean { return TRUE; },
+      visit.release(), [](gpointer ended) { delete static_cast<ServerVisit*>(ended); });
+}
 
 /// Asked before the sink is made, because a sink without a server fails loudly, and late.
 bool IsSoundServerThere() { return ServerVisit().Connect(); }
@@ -144,13 +154,10 @@ class RoleFollower {
   /// A server's sink without a stream falls asleep, and is then two seconds late to the next one:
   /// silence keeps it awake until the new stream is played.
   void Follow(GstPad* pad, GstBuffer* sound) {
-    if (silence_.has_value() && GST_BUFFER_PTS(sound) - replacedAt_ > kSilenceAfter)
-      silence_.reset();
     const char* role = GetPlayerRole();
     if (HasRole(sink_, role)) return;
-    replacedAt_ = GST_BUFFER_PTS(sound);
-    silence_.emplace();
-    if (silence_->Connect()) silence_->PlaySilence();
+    auto silence = std::make_unique<ServerVisit>();
+    if (silence->Connect()) silence->PlaySilence();
     AwaitEnd(sink_, sound);
     SetStreamProperties(sink_, role);
     NoteStreamReplaced();
@@ -161,11 +168,10 @@ class RoleFollower {
       GST_ELEMENT_ERROR(sink_, RESOURCE, FAILED, ("The sound server makes no new stream"),
                         (nullptr));
     }
+    EndLater(std::move(silence), kSilenceAfter);
   }
 
   GstElement* const sink_;
-  std::optional<ServerVisit> silence_;
-  GstClockTime replacedAt_ = 0;
 };
 
 /// A name of its own for each sink: sinks of one name share a connection, and with it the end of a

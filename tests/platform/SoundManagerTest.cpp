@@ -1,25 +1,16 @@
 // What the library relies on in the sound manager, shown by the simulated device, and its steering.
 
 #include "support/Gate.h"
+#include "support/LibraryTest.h"
 #include "support/NativeListener.h"
 
-#include <Simulated/Device.h>
-
-#include <gmock/gmock.h>
-#include <gtest/gtest.h>
-
 #include <thread>
-#include <vector>
 
 namespace {
 
 using testing::ElementsAre;
 
-class SoundManagerTest : public testing::Test {
- protected:
-  SoundManagerTest() { Simulated::Reset(); }
-  ~SoundManagerTest() override { Simulated::Reset(); }
-};
+using SoundManagerTest = LibraryTest;
 
 TEST_F(SoundManagerTest, ReportsTellEveryChangeOnceInOrderOnOneThreadOfTheDevicesOwn) {
   std::vector<std::thread::id> threads;

@@ -7,7 +7,6 @@
 #include <Simulated/Device.h>
 
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
 
 #include <algorithm>
 

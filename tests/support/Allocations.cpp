@@ -9,7 +9,6 @@
 
 namespace {
 
-std::atomic<std::size_t> count{0};
 std::atomic<std::ptrdiff_t> live{0};
 
 std::atomic<bool> isArmed{false};
@@ -24,7 +23,6 @@ bool Fails(FailingAllocation::Whose whose) {
 }
 
 void* Allocate(std::size_t size, FailingAllocation::Whose whose) {
-  ++count;
   if (Fails(whose)) return nullptr;
   live.fetch_add(1, std::memory_order_relaxed);
   return std::malloc(size);
@@ -48,8 +46,6 @@ void operator delete(void* memory) noexcept {
   std::free(memory);
 }
 void operator delete(void* memory, std::size_t) noexcept { operator delete(memory); }
-
-std::size_t CountAllocations() { return count; }
 
 std::ptrdiff_t CountLiveAllocations() { return live; }
 

@@ -6,10 +6,7 @@
 #include <cstddef>
 #include <cstdint>
 
-/// \return how many allocations the program has made with `new`.
-std::size_t CountAllocations();
-
-/// \return how many of them haven't been freed.
+/// \return how many allocations with `new` haven't been freed.
 std::ptrdiff_t CountLiveAllocations();
 
 /// Makes allocations fail while it lives.

@@ -5,6 +5,7 @@
 #include <sound_manager.h>
 
 #include <climits>
+#include <tuple>
 
 namespace Zelkora::Media {
 namespace {
@@ -31,22 +32,24 @@ TEST_F(SessionMode, IsSentAsASessionTypeAndForMixAnOptionPair) {
 TEST_F(SessionMode, IsReadFromTheSessionTypeAndOnlyThenFromTheFirstOption) {
   const std::string none, type = "sound_manager_get_session_type",
                           option = "sound_manager_get_media_session_option";
-  const struct {
-    int type, first, second;
-    std::string unanswered;  // the query that succeeds without an answer
-    int mode;
-  } rows[] = {{0, 0, 0, none, 0}, {0, 1, 0, none, 1},  {0, 1, 5, none, 1}, {0, 2, 1, none, 0},
-              {3, 1, 0, none, 2}, {2, 1, 0, none, 3},  {1, 1, 0, none, 4}, {1, 0, 0, none, 4},
-              {3, 1, 0, type, 1}, {0, 1, 0, option, 0}};
-  for (const auto& row : rows) {
-    SCOPED_TRACE(testing::Message() << row.type << ' ' << row.first << ' ' << row.unanswered);
-    sound_manager_set_session_type(row.type);
-    sound_manager_set_media_session_option(row.first, row.second);
-    if (row.unanswered != none) Host::FailCall(row.unanswered.c_str(), 0, 1);
+  for (const auto& [set, first, second, unanswered, mode] : {std::tuple{0, 0, 0, none, 0},
+                                                             {0, 1, 0, none, 1},
+                                                             {0, 1, 5, none, 1},
+                                                             {0, 2, 1, none, 0},
+                                                             {3, 1, 0, none, 2},
+                                                             {2, 1, 0, none, 3},
+                                                             {1, 1, 0, none, 4},
+                                                             {1, 0, 0, none, 4},
+                                                             {3, 1, 0, type, 1},
+                                                             {0, 1, 0, option, 0}}) {
+    SCOPED_TRACE(testing::Message() << set << ' ' << first << ' ' << unanswered);
+    sound_manager_set_session_type(set);
+    sound_manager_set_media_session_option(first, second);
+    if (unanswered != none) Host::FailCall(unanswered.c_str(), 0, 1);  // without an answer
     Forget();
-    EXPECT_EQ(manager.GetMode(), row.mode);
+    EXPECT_EQ(manager.GetMode(), mode);
     Lines calls = {PrivilegeQuery<Session>(), type + "()"};
-    if (row.mode <= 1) calls.push_back(option + "()");
+    if (mode <= 1) calls.push_back(option + "()");
     ExpectLeft(kUntouched, {}, calls);
   }
 }
@@ -136,14 +139,12 @@ TEST_F(Calls, OneIsOpenUntilItIsExitedAndHasAModeOfItsOwn) {
     EXPECT_EQ(manager.EnterCallSession(), E_SUCCESS);
     EXPECT_EQ(manager.EnterCallSession(), E_INVALID_OPERATION);
     EXPECT_EQ(manager.GetCallSessionMode(), VOIP_AUDIO_SESSION_MODE_VOICE);
-    const struct {
-      int mode, platformMode, readBack;
-    } rows[] = {{0, 0, 1}, {3, 2, 3}, {1, 0, 1}, {2, 1, 2}};
-    for (const auto& row : rows) {
-      SCOPED_TRACE(row.mode);
-      EXPECT_EQ(manager.SetCallSessionMode(Mode(row.mode)), E_SUCCESS);
-      EXPECT_THAT(World::GetCallModes(), ElementsAre(row.platformMode));
-      EXPECT_EQ(manager.GetCallSessionMode(), row.readBack);
+    for (const auto& [mode, platformMode, readBack] :
+         {std::tuple{0, 0, 1}, {3, 2, 3}, {1, 0, 1}, {2, 1, 2}}) {
+      SCOPED_TRACE(mode);
+      EXPECT_EQ(manager.SetCallSessionMode(Mode(mode)), E_SUCCESS);
+      EXPECT_THAT(World::GetCallModes(), ElementsAre(platformMode));
+      EXPECT_EQ(manager.GetCallSessionMode(), readBack);
     }
     for (const int mode : {-1, 4, 5, INT_MAX, INT_MIN}) {
       EXPECT_EQ(manager.SetCallSessionMode(Mode(mode)), E_INVALID_ARG);

@@ -1,29 +1,21 @@
 // The desktop player's effects, on sound that sox makes and measures: it is rendered with the
 // effects that are set, and the file is judged.
 
-#include "GstreamerEnd.h"
+#include "PlayerOnMedia.h"
 
-#include <Tizen/Base/Result.h>
-#include <Tizen/Media/Player.h>
 #include <Zelkora/Media/AudioEffector.h>
-#include <gmock/gmock.h>
-#include <unistd.h>
 
 #include <array>
 #include <cmath>
 #include <cstdio>
-#include <cstdlib>
 #include <filesystem>
 #include <memory>
-#include <string>
 #include <utility>
 #include <valarray>
-#include <vector>
 
 namespace {
 
 using namespace Zelkora::Media;
-using Tizen::Media::Player;
 
 std::string RunCommand(const std::string& command) {
   FILE* output = popen((command + " 2>&1").c_str(), "r");
@@ -74,13 +66,11 @@ constexpr std::array<Level, 5> kHighest{{{AUDIO_EFFECT_BASS, 12},
                                          {AUDIO_EFFECT_STEREO_WIDTH, 100},
                                          {AUDIO_EFFECT_DYNAMICS, 100}}};
 
-/// A player and its effector without a sound server, and a directory of its own.
-class EffectsTest : public testing::Test {
+/// A player and its effector, and a directory of its own.
+class EffectsTest : public PlayerOnMedia {
  protected:
   EffectsTest() {
-    setenv("PULSE_SERVER", "unix:/nonexistent/pulse", 1);
     std::filesystem::create_directories(directory_);
-    EXPECT_EQ(player.Construct(), E_SUCCESS);
     EXPECT_EQ(effector.Construct(player), E_SUCCESS);
   }
 
@@ -133,7 +123,6 @@ class EffectsTest : public testing::Test {
     EXPECT_EQ(effector.SetEffectPreset(static_cast<AudioEffectPreset>(preset)), E_SUCCESS);
   }
 
-  Player player;
   AudioEffector effector;
 
  private:
@@ -148,8 +137,7 @@ bool WorksWithout(const char* element) {
   GstRegistry* registry = gst_registry_get();
   gst_registry_remove_feature(registry, gst_registry_lookup_feature(registry, element));
   const bool hasReverb = std::string(element) != "freeverb";
-  const std::string sound = std::string(std::getenv("ZELKORA_TEST_MEDIA")) + "/sound.ogg";
-  Player player;
+  Tizen::Media::Player player;
   AudioEffector effector;
   return player.Construct() == E_SUCCESS && effector.Construct(player) == E_SUCCESS &&
          Count(effector.GetSupportedEffectListN()) == (hasReverb ? 5 : 4) &&
@@ -157,7 +145,7 @@ bool WorksWithout(const char* element) {
              (hasReverb ? E_SUCCESS : E_INVALID_OPERATION) &&
          effector.SetEffectLevel(AUDIO_EFFECT_BASS, 1) == E_SUCCESS &&
          effector.SetEffectPreset(AUDIO_EFFECT_PRESET_CONCERT_HALL) == E_SUCCESS &&
-         player.OpenFile(sound.c_str()) == E_SUCCESS && player.Play() == E_SUCCESS;
+         player.OpenFile(Media("sound.ogg").c_str()) == E_SUCCESS && player.Play() == E_SUCCESS;
 }
 
 TEST(SystemWithoutElement, GivesTheOtherEffectsAndSaysWhatIsMissing) {

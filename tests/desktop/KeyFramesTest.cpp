@@ -4,7 +4,6 @@
 #include "PlayerOnMedia.h"
 
 #include <dlfcn.h>
-#include <gst/gst.h>
 
 #include <algorithm>
 #include <atomic>

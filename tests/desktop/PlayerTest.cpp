@@ -4,7 +4,6 @@
 #include "PlayerOnMedia.h"
 
 #include <sys/stat.h>
-#include <unistd.h>
 
 #include <climits>
 #include <random>
@@ -76,25 +75,21 @@ TEST_F(PlayerTest, ExactSeekTellsKeyFramesFromOthersAndReturnsToEachReportedPosi
 
 TEST_F(PlayerTest, WhatCantBeOpenedIsRefusedWithItsReason) {
   mkfifo(Media("pipe.webm").c_str(), 0600);
-  const struct {
-    const char* name;
-    result expected;
-    const char* reason;
-  } kCases[] = {{"missing.webm", E_OBJ_NOT_FOUND, "No such file"},
-                {"text.webm/film.webm", E_OBJ_NOT_FOUND, "Not a directory"},
-                {"", E_INVALID_ARG, "not a plain file"},
-                {"pipe.webm", E_INVALID_ARG, "not a plain file"},
-                {"empty.webm", E_INVALID_ARG, "can't be played: "},
-                {"text.webm", E_INVALID_ARG, "can't be played: "},
-                {"truncated.webm", E_INVALID_ARG, "can't be played: "},
-                {"cut.mp4", E_INVALID_ARG, "can't be played: "}};
-  for (const auto& bad : kCases) {
-    SCOPED_TRACE(bad.name);
+  for (const auto& [name, expected, reason] :
+       {std::tuple{"missing.webm", E_OBJ_NOT_FOUND, "No such file"},
+        {"text.webm/film.webm", E_OBJ_NOT_FOUND, "Not a directory"},
+        {"", E_INVALID_ARG, "not a plain file"},
+        {"pipe.webm", E_INVALID_ARG, "not a plain file"},
+        {"empty.webm", E_INVALID_ARG, "can't be played: "},
+        {"text.webm", E_INVALID_ARG, "can't be played: "},
+        {"truncated.webm", E_INVALID_ARG, "can't be played: "},
+        {"cut.mp4", E_INVALID_ARG, "can't be played: "}}) {
+    SCOPED_TRACE(name);
     ExpectPlayerWorks();
     CaptureStderr();
-    EXPECT_EQ(Open(bad.name), bad.expected);
-    EXPECT_EQ(GetLastResult(), bad.expected);
-    EXPECT_THAT(GetCapturedStderr(), HasSubstr(bad.reason));
+    EXPECT_EQ(Open(name), expected);
+    EXPECT_EQ(GetLastResult(), expected);
+    EXPECT_THAT(GetCapturedStderr(), HasSubstr(reason));
     EXPECT_EQ(player.GetPosition(), -1) << "a file is still open";
   }
   ExpectPlayerWorks();

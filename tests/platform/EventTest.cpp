@@ -9,7 +9,6 @@
 #include <Tizen/Base/Runtime/Event.h>
 
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
 #include <sound_manager.h>
 
 #include <atomic>
@@ -26,9 +25,7 @@ namespace {
 
 using testing::ElementsAre;
 using testing::IsEmpty;
-using Tizen::Base::Runtime::_Event;
-using Tizen::Base::Runtime::IEventArg;
-using Tizen::Base::Runtime::IEventListener;
+using namespace Tizen::Base::Runtime;
 
 std::atomic<int> livingArguments{0};
 

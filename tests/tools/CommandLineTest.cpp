@@ -17,18 +17,12 @@
 namespace {
 
 namespace fs = std::filesystem;
-using testing::AllOf;
-using testing::ContainsRegex;
-using testing::EndsWith;
-using testing::HasSubstr;
-using testing::MatchesRegex;
-using testing::Not;
-using testing::StartsWith;
-using Text = testing::Matcher<const std::string&>;
+using namespace testing;
+using Text = Matcher<const std::string&>;
 
 /// Each test has an empty folder of its own to run in. "$Z" runs the program on the simulated
 /// device, "$D" on the desktop one.
-class CommandLine : public testing::Test {
+class CommandLine : public Test {
  protected:
   CommandLine() {
     setenv("LSAN_OPTIONS", "print_suppressions=0:suppressions=" LEAKS_OF_OTHERS, 0);
@@ -155,7 +149,7 @@ TEST_F(CommandLine, RenderingThatIsInterruptedLeavesNothingAndOnAPipeIsWhole) {
         "$D effects a.wav --render b.wav >/dev/null & until ls .zelkora-*/*.part; do "
         "kill -0 $! || exit; done >/dev/null 2>&1; kill -" +
             std::string(signal) + " $!; wait $!",
-        code, "", testing::_);
+        code, "", _);
     Expect("ls -A", 0, "a.wav\n");
   }
   Expect("$D effects a.wav --render - | sox -t wav - -t raw - | wc -c", 0, "100000000\n");

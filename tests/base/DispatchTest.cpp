@@ -9,8 +9,9 @@
 
 #include <climits>
 
-namespace Zelkora::Media {
 namespace {
+
+using namespace Zelkora::Media;
 
 static_assert(std::size(kCategories) == kSoundTypeCount, "a category has no name");
 
@@ -43,4 +44,3 @@ TEST_F(DispatchTest, ForeignListenersAndUnknownEventTypesAreLoggedAndSkipped) {
 }
 
 }  // namespace
-}  // namespace Zelkora::Media

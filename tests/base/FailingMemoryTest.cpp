@@ -5,8 +5,9 @@
 #include "support/Operations.h"
 #include "support/OwnProcess.h"
 
-namespace Zelkora::Media {
 namespace {
+
+using namespace Zelkora::Media;
 
 /// \return the result that an operation lists for short memory besides `E_OUT_OF_MEMORY`
 result OtherResult(const std::string& name) {
@@ -86,4 +87,3 @@ TEST(FailingMemory, IsAListedResultOfEachOperationLeaksNothingAndEndsWithTheShor
 }
 
 }  // namespace
-}  // namespace Zelkora::Media

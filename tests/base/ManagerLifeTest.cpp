@@ -24,8 +24,9 @@ static bool hasLostThreads = false;
 extern "C" int __lsan_is_turned_off();
 extern "C" int __lsan_is_turned_off() { return hasLostThreads; }
 
-namespace Zelkora::Media {
 namespace {
+
+using namespace Zelkora::Media;
 
 #ifdef __SANITIZE_THREAD__
 constexpr int kProcesses = 10;  // each waits a second for threads that still run
@@ -235,4 +236,3 @@ TEST_F(ProcessExit, OfAForkedChildEndsThoughAListenersCallRanAtTheFork) {
 }
 
 }  // namespace
-}  // namespace Zelkora::Media

@@ -3,8 +3,9 @@
 #include <climits>
 #include <tuple>
 
-namespace Zelkora::Media {
 namespace {
+
+using namespace Zelkora::Media;
 
 using Values = std::vector<int>;
 
@@ -169,4 +170,3 @@ TEST_F(EffectorTest, ListHoldsTheKnownValuesInThePlayersOrderAndIsNullWhenThePla
 }
 
 }  // namespace
-}  // namespace Zelkora::Media

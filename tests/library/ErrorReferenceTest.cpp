@@ -10,8 +10,9 @@
 #include <regex>
 #include <set>
 
-namespace Zelkora::Media {
 namespace {
+
+using namespace Zelkora::Media;
 
 /// A row of the page, or a case of it: one class, one operation, one code.
 struct Row {
@@ -341,4 +342,3 @@ TEST_F(ErrorReference, HasARowForEachFailureOfEachOperationOfTheHeaders) {
 }
 
 }  // namespace
-}  // namespace Zelkora::Media

@@ -7,8 +7,9 @@
 #include <climits>
 #include <tuple>
 
-namespace Zelkora::Media {
 namespace {
+
+using namespace Zelkora::Media;
 
 using testing::ElementsAre;
 using testing::IsEmpty;
@@ -193,4 +194,3 @@ TEST(SoundManager, RefusesWrongArgumentsChangingNothing) {
 }
 
 }  // namespace
-}  // namespace Zelkora::Media

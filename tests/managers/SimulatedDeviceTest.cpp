@@ -16,8 +16,9 @@ int sound_manager_call_session_get_mode(sound_call_session_h, int* mode) {
   return 0;
 }
 
-namespace Zelkora::Media {
 namespace {
+
+using namespace Zelkora::Media;
 
 class SessionCodes : public ManagerTest<Session> {
  protected:
@@ -169,4 +170,3 @@ INSTANTIATE_TEST_SUITE_P(ToListeners, ManyChanges, testing::Values(1, 10, 1000),
                          testing::PrintToStringParamName());
 
 }  // namespace
-}  // namespace Zelkora::Media

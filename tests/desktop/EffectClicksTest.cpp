@@ -5,7 +5,6 @@
 #include "desktop/player/effects/Chain.h"
 
 #include <gst/check/gstharness.h>
-#include <gtest/gtest.h>
 
 #include <algorithm>
 #include <array>
@@ -113,10 +112,11 @@ void ChangeSomething(SharedSettings* settings, std::mt19937* random) {
 class EffectClicks : public testing::TestWithParam<int> {
  protected:
   static void SetUpTestSuite() { gst_init(nullptr, nullptr); }
+
+  SharedSettings settings;
 };
 
 TEST_P(EffectClicks, ThousandChangesStayFarBelowTheSound) {
-  SharedSettings settings;
   Listening tone(settings);
   std::mt19937 random(1);
   for (int change = 0; change < 1000; ++change) {
@@ -130,7 +130,6 @@ TEST_P(EffectClicks, ThousandChangesStayFarBelowTheSound) {
 }
 
 TEST_P(EffectClicks, FirstChangeFromRestStaysFarBelowTheSound) {
-  SharedSettings settings;
   Listening tone(settings);
   for (int buffer = 0; buffer < 400; ++buffer) {
     ASSERT_NO_FATAL_FAILURE(tone.SendTone(GetParam()));
@@ -146,7 +145,6 @@ INSTANTIATE_TEST_SUITE_P(BuffersOf, EffectClicks, testing::Values(256, 1024, 409
 class EffectsAtRest : public EffectClicks {};
 
 TEST_P(EffectsAtRest, EverySampleComesOutAtItsTimeBehindTheSameDelay) {
-  SharedSettings settings;
   Listening listening(settings, GetParam());
   std::mt19937 random(1);
   std::vector<float> sent;

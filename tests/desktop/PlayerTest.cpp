@@ -11,13 +11,10 @@
 
 namespace {
 
-using testing::Each;
-using testing::HasSubstr;
-using testing::Not;
+using namespace testing;
+using namespace Tizen::Media;
 using testing::internal::CaptureStderr;
 using testing::internal::GetCapturedStderr;
-using Tizen::Media::_PlayerImpl;
-using Tizen::Media::VideoFrame;
 
 class PlayerTest : public PlayerOnMedia {
  protected:
@@ -182,8 +179,7 @@ TEST_F(PlayerTest, FileThatIsDamagedOrShrinksWhileOpenEndsInAResultInBoundedTime
 }
 
 TEST_F(PlayerTest, FileTooLongToBeReadIsSoughtInAsWellAsItsContainerCanAndClosedAtOnce) {
-  using std::chrono::seconds;
-  using std::chrono::steady_clock;
+  using namespace std::chrono;
   const ScratchFile film("long.ts", ReadFile(Media("h264.ts")));
   ASSERT_EQ(truncate(film.path.c_str(), 300'000'000'000), 0);
   ASSERT_EQ(player.OpenFile(film.path.c_str()), E_SUCCESS);
@@ -199,7 +195,7 @@ TEST_F(PlayerTest, FileTooLongToBeReadIsSoughtInAsWellAsItsContainerCanAndClosed
 
   std::vector<long> keyFrames{7};
   std::thread search([&] { EXPECT_EQ(player.GetKeyFrames(keyFrames), E_SYSTEM); });
-  std::this_thread::sleep_for(std::chrono::milliseconds(300));
+  std::this_thread::sleep_for(milliseconds(300));
   begin = steady_clock::now();
   EXPECT_EQ(player.Close(), E_SUCCESS);
   EXPECT_LT(steady_clock::now() - begin, seconds(3));

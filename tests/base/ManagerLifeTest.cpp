@@ -105,16 +105,6 @@ TYPED_TEST(ManagerLife, IsBegunOnceByTheFirstOfManyThreadsThatPassBothGates) {
   });
 }
 
-/// Runs its checks at exit, after the managers are gone: made before them.
-void CheckAtExit(std::function<void()> checks) {
-  static std::function<void()> kept;
-  kept = std::move(checks);
-  std::atexit([] {
-    kept();
-    if (testing::Test::HasFailure()) std::_Exit(1);
-  });
-}
-
 using ProcessExit = LibraryTest;
 
 TEST_F(ProcessExit, DeletesTheManagersUnregisteringFirstAndLateCallsFindNone) {

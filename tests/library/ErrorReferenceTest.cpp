@@ -242,18 +242,15 @@ class ErrorReference : public LibraryTest {
   /// \return whether that is well
   bool Provoke(const Row& row, const std::function<void(const Lines&)>& judge) {
     return StatusOfOwnProcess([&, this] {
-             static std::function<void()> finish;
              std::string answer;
-             finish = [&, this] {
+             const auto finish = [&, this] {
                Lines outcome = {answer, GetErrorMessage(GetLastResult())};
                failing.reset();
                for (const std::string& line : log.Take()) outcome.push_back(line);
                judge(outcome);
              };
              const bool isAtExit = row.cause.find("at exit") != row.cause.npos;
-             if (isAtExit) {  // what comes first is run last there
-               std::atexit([] { finish(), std::_Exit(HasFailure()); });
-             }
+             if (isAtExit) CheckAtExit(finish);  // what comes first is run last there
              Prepare(row.operation);
              Arrange(row);
              if (isAtExit) std::exit(0);

@@ -193,16 +193,9 @@ TEST_F(Delivery, FromTwoThreadsKeepsEachOnesOrderWhileListenersAndEventsComeAndG
   EXPECT_THAT(heard, testing::Each(all));
 }
 
-/// A listener whose call takes a while once the gate is open.
 struct SlowListener : Listener {
-  SlowListener()
-      : Listener([this](int) {
-          gate.Pass();
-          for (int i = 0; i < 1000; ++i) std::this_thread::yield();  // time for who doesn't wait
-          finished = true;
-        }) {}
-  Gate gate;
-  bool finished = false;  // plain, so that a race shows
+  SlowListener() : Listener([this](int) { call(); }) {}
+  SlowCall call;
 };
 
 TEST_F(RemovingAListener, WaitsForItsOwnCallOnly) {
@@ -211,13 +204,10 @@ TEST_F(RemovingAListener, WaitsForItsOwnCallOnly) {
   Listener next([&](int) { gate.Pass(); }), removed;
   ReadyEvent event({&listener, &next, &removed}), sameListenersEvent({&listener});
   event.Fire(1);
-  listener.gate.AwaitVisitor();
+  listener.call.gate.AwaitVisitor();
   EXPECT_EQ(event.RemoveListener(removed), E_SUCCESS);
   EXPECT_EQ(sameListenersEvent.RemoveListener(listener), E_SUCCESS);
-  std::thread opener([&] { listener.gate.Open(); });
-  EXPECT_EQ(event.RemoveListener(listener), E_SUCCESS);
-  EXPECT_TRUE(listener.finished);
-  opener.join();
+  listener.call.ExpectAwaitedBy([&] { EXPECT_EQ(event.RemoveListener(listener), E_SUCCESS); });
   gate.Open();
   Host::WaitUntilDelivered();
   EXPECT_THAT(removed.heard, IsEmpty());
@@ -229,12 +219,11 @@ TEST_F(DestroyingAnEvent, WaitsForItsCallAndMakesNoOther) {
   Listener next;
   auto event = std::make_unique<ReadyEvent>(std::vector<Listener*>{&listener, &next});
   for (const int value : {1, 2}) event->Fire(value);
-  listener.gate.AwaitVisitor();
-  std::thread opener([&] { listener.gate.Open(); });
-  event.reset();
-  EXPECT_TRUE(listener.finished);
-  EXPECT_EQ(livingArguments, 0);
-  opener.join();
+  listener.call.gate.AwaitVisitor();
+  listener.call.ExpectAwaitedBy([&] {
+    event.reset();
+    EXPECT_EQ(livingArguments, 0);
+  });
   EXPECT_THAT(next.heard, IsEmpty());
 }
 
@@ -276,10 +265,10 @@ TEST(ProcessDeathTest, EndsAfterTheCallThatIsRunningWithAnEventThatOutlivesTheDi
       isCalled = false;
     });
     static std::thread waiting;
-    std::atexit([] {
-      if (isCalled || event.Fire(1) != E_SYSTEM || event.RemoveListener(listener) != E_SUCCESS) {
-        _exit(1);
-      }
+    CheckAtExit([] {
+      EXPECT_FALSE(isCalled);
+      EXPECT_EQ(event.Fire(1), E_SYSTEM);
+      EXPECT_EQ(event.RemoveListener(listener), E_SUCCESS);
       waiting.join();
     });
     event.Initialize();

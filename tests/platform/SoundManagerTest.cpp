@@ -38,16 +38,12 @@ TEST_F(SoundManagerTest, ReportsTellEveryChangeOnceInOrderOnOneThreadOfTheDevice
 }
 
 TEST_F(SoundManagerTest, UnsettingACallbackWaitsForItsCallAndDropsWhatIsOnTheWayForItAlone) {
-  Gate gate;
-  bool finished = false;
+  SlowCall first;
   NativeListener listener(NativeListener::kAll, [&] {
-    if (finished) return;
-    gate.Pass();
-    for (int i = 0; i < 1000; ++i) std::this_thread::yield();  // time for who doesn't wait
-    finished = true;
+    if (!first.finished) first();
   });
   Simulated::ReportMuteAll(true);
-  gate.AwaitVisitor();
+  first.gate.AwaitVisitor();
   Simulated::Interrupt(1);
   Simulated::ResetSoundManager();
   Simulated::Interrupt(2);
@@ -56,10 +52,7 @@ TEST_F(SoundManagerTest, UnsettingACallbackWaitsForItsCallAndDropsWhatIsOnTheWay
   EXPECT_EQ(sound_manager_unset_volume_changed_cb(), 0);
   NativeListener next(NativeListener::kLevels);
   Simulated::ReportVolume(4, 2);
-  std::thread opener([&] { gate.Open(); });
-  EXPECT_EQ(sound_manager_unset_muteall_changed_cb(), 0);
-  EXPECT_TRUE(finished);
-  opener.join();
+  first.ExpectAwaitedBy([] { EXPECT_EQ(sound_manager_unset_muteall_changed_cb(), 0); });
   Simulated::ReportMuteAll(false);
   EXPECT_THAT(listener.TakeAll(), ElementsAre("muted", "code 2"));
   EXPECT_THAT(next.TakeAll(), ElementsAre("4=2"));

@@ -9,6 +9,7 @@
 
 #include <cstdio>
 #include <cstdlib>
+#include <functional>
 #include <limits>
 
 /// Runs \p body in a process of its own, which then exits as a program does: with its exit handlers
@@ -32,6 +33,16 @@ int StatusOfOwnProcess(Body body) {
 template <typename Body>
 void InOwnProcess(Body body) {
   EXPECT_EQ(StatusOfOwnProcess(body), 0);
+}
+
+/// Runs checks at exit, after all that is made later than this call is gone.
+inline void CheckAtExit(std::function<void()> checks) {
+  static std::function<void()> kept;
+  kept = std::move(checks);
+  std::atexit([] {
+    kept();
+    if (testing::Test::HasFailure()) std::_Exit(1);
+  });
 }
 
 /// \return what \p function gives while no thread can be started

@@ -56,9 +56,8 @@ class NativeListener : public Inbox {
   static constexpr int kLevels = 1, kMuteAll = 2, kInterruptions = 4, kAll = 7;
 
   /// \param kinds what it hears
-  /// \param onReport called after each
-  explicit NativeListener(
-      int kinds, std::function<void()> onReport = [] {})
+  /// \param onReport called after each, if there is one
+  explicit NativeListener(int kinds, std::function<void()> onReport = {})
       : kinds_(kinds), onReport_(std::move(onReport)) {
     if (kinds & kLevels) {
       sound_manager_set_volume_changed_cb(
@@ -84,7 +83,7 @@ class NativeListener : public Inbox {
   static void Hear(void* self, std::string text) {
     auto& listener = *static_cast<NativeListener*>(self);
     listener.Put(std::move(text));
-    listener.onReport_();
+    if (listener.onReport_) listener.onReport_();
   }
 
   const int kinds_;

@@ -190,24 +190,20 @@ TEST_F(EffectsTest, DefaultSettingsKeepEverySampleAndResetBringsThemBack) {
 TEST_F(EffectsTest, BassAndTrebleMoveTheirEndOfTheRange) {
   const std::string full = MakeTones(kStereo, {60, 1000, 10000});
   const std::string low = MakeTones("-r 8000 -c 1 -b 16", {500, 1000, 2000});
-  const struct {
-    const std::string& source;
-    Level effect;
-    AudioEffectPreset preset;
-    std::array<double, 3> loudness;  // of the tones
-  } cases[] = {{full, {AUDIO_EFFECT_BASS, 12}, AUDIO_EFFECT_PRESET_NORMAL, {-17, -29, -29}},
-               {full, {AUDIO_EFFECT_BASS, -12}, AUDIO_EFFECT_PRESET_NORMAL, {-41, -29, -29}},
-               {full, {AUDIO_EFFECT_TREBLE, 12}, AUDIO_EFFECT_PRESET_NORMAL, {-29, -29, -17}},
-               {full, {AUDIO_EFFECT_TREBLE, -12}, AUDIO_EFFECT_PRESET_NORMAL, {-29, -29, -41}},
-               {full, {AUDIO_EFFECT_BASS, 12}, AUDIO_EFFECT_PRESET_TREBLE_BOOST, {-23, -32, -26}},
-               // What of the preset is above the low rate's range stays away.
-               {low, {AUDIO_EFFECT_TREBLE, 0}, AUDIO_EFFECT_PRESET_TREBLE_BOOST, {-34, -33, -31}},
-               {low, {AUDIO_EFFECT_TREBLE, 12}, AUDIO_EFFECT_PRESET_TREBLE_BOOST, {-32, -28, -23}}};
-  for (const auto& [source, effect, preset, loudness] : cases) {
+  const std::tuple<std::string, Level, AudioEffectPreset, std::array<double, 3>> cases[] = {
+      {full, {AUDIO_EFFECT_BASS, 12}, AUDIO_EFFECT_PRESET_NORMAL, {-17, -29, -29}},
+      {full, {AUDIO_EFFECT_BASS, -12}, AUDIO_EFFECT_PRESET_NORMAL, {-41, -29, -29}},
+      {full, {AUDIO_EFFECT_TREBLE, 12}, AUDIO_EFFECT_PRESET_NORMAL, {-29, -29, -17}},
+      {full, {AUDIO_EFFECT_TREBLE, -12}, AUDIO_EFFECT_PRESET_NORMAL, {-29, -29, -41}},
+      {full, {AUDIO_EFFECT_BASS, 12}, AUDIO_EFFECT_PRESET_TREBLE_BOOST, {-23, -32, -26}},
+      // What of the preset is above the low rate's range stays away.
+      {low, {AUDIO_EFFECT_TREBLE, 0}, AUDIO_EFFECT_PRESET_TREBLE_BOOST, {-34, -33, -31}},
+      {low, {AUDIO_EFFECT_TREBLE, 12}, AUDIO_EFFECT_PRESET_TREBLE_BOOST, {-32, -28, -23}}};
+  for (const auto& [source, effect, preset, tones] : cases) {
     SCOPED_TRACE(testing::Message() << effect.type << " at " << effect.level << ", " << preset);
     const std::string rendered = Render(source, effect, preset);
     for (std::size_t tone = 0; tone < 3; ++tone) {
-      EXPECT_NEAR(MeasureSecond(rendered, tone), loudness[tone], 1) << "tone " << tone;
+      EXPECT_NEAR(MeasureSecond(rendered, tone), tones[tone], 1) << "tone " << tone;
     }
   }
 }

@@ -83,11 +83,7 @@ TEST_F(EffectorTest, PlayerIsSupportedWithAnyKnownEffectOrPreset) {
 }
 
 TEST_F(EffectorTest, KnownValuesAloneReachThePlayerUnderItsNumbers) {
-  const struct {
-    std::string name, function;
-    const Kind& kind;
-    std::pair<int, int> (*answer)(int);
-  } rows[] = {
+  const std::tuple<std::string, std::string, const Kind&, std::pair<int, int> (*)(int)> rows[] = {
       {"SetEffectLevel", "player_audio_effect_set_value", kEffects, [](int) { return kUnwritten; }},
       {"GetEffectLevel", "player_audio_effect_get_value", kEffects,
        [](int value) { return std::pair(value, 999); }},

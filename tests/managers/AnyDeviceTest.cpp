@@ -9,10 +9,8 @@
 
 namespace {
 
+using namespace testing;
 using namespace Zelkora::Media;
-
-using testing::ElementsAre;
-using testing::IsEmpty;
 
 using SessionMode = ManagerTest<Session>;
 
@@ -33,20 +31,16 @@ TEST_F(SessionMode, IsSentAsASessionTypeAndForMixAnOptionPair) {
 TEST_F(SessionMode, IsReadFromTheSessionTypeAndOnlyThenFromTheFirstOption) {
   const std::string none, type = "sound_manager_get_session_type",
                           option = "sound_manager_get_media_session_option";
-  for (const auto& [set, first, second, unanswered, mode] : {std::tuple{0, 0, 0, none, 0},
-                                                             {0, 1, 0, none, 1},
-                                                             {0, 1, 5, none, 1},
-                                                             {0, 2, 1, none, 0},
-                                                             {3, 1, 0, none, 2},
-                                                             {2, 1, 0, none, 3},
-                                                             {1, 1, 0, none, 4},
-                                                             {1, 0, 0, none, 4},
-                                                             {3, 1, 0, type, 1},
-                                                             {0, 1, 0, option, 0}}) {
-    SCOPED_TRACE(testing::Message() << set << ' ' << first << ' ' << unanswered);
+  const std::tuple<int, int, int, std::string, int> rows[] = {
+      {0, 0, 0, none, 0}, {0, 1, 0, none, 1},  {0, 1, 5, none, 1}, {0, 2, 1, none, 0},
+      {3, 1, 0, none, 2}, {2, 1, 0, none, 3},  {1, 1, 0, none, 4}, {1, 0, 0, none, 4},
+      {3, 1, 0, type, 1}, {0, 1, 0, option, 0}};
+  for (const auto& [set, first, second, unanswered, mode] : rows) {
+    SCOPED_TRACE(Message() << set << ' ' << first << ' ' << unanswered);
     sound_manager_set_session_type(set);
     sound_manager_set_media_session_option(first, second);
-    if (unanswered != none) Host::FailCall(unanswered.c_str(), 0, 1);  // without an answer
+    // One query succeeds without an answer.
+    if (unanswered != none) Host::FailCall(unanswered.c_str(), 0, 1);
     Forget();
     EXPECT_EQ(manager.GetMode(), mode);
     Lines calls = {PrivilegeQuery<Session>(), type + "()"};

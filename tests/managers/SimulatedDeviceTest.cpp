@@ -7,6 +7,7 @@
 
 #include <climits>
 #include <deque>
+#include <tuple>
 
 static int reportedMode = 0;
 
@@ -62,23 +63,21 @@ TEST_F(SessionCodes, SwallowingIsLeftAsItIsByWhatNobodyHears) {
 
 TEST_F(SessionCodes, AnotherListenerTakesThePlaceOfTheOneBeforeUnlessThatCantBeRemoved) {
   SessionListener other;
-  const struct {
-    IAudioSessionEventListener* next;
-    std::string refuses, heard, otherHeard;
-  } rows[] = {{&other, "", "", "started "},
-              {&other, "", "", "started "},
-              {nullptr, "", "", ""},
-              {nullptr, "", "", ""},
-              {&listener, "", "started ", ""},
-              {&other, "_Event::RemoveListener", "started ", ""},
-              {&other, "_Event::AddListener", "", ""},
-              {&listener, "", "started ", ""}};
-  for (const auto& row : rows) {
-    if (!row.refuses.empty()) Host::FailCall(row.refuses.c_str(), E_INVALID_STATE, 1);
-    EXPECT_EQ(manager.SetAudioSessionEventListener(row.next),
-              row.refuses.empty() ? E_SUCCESS : E_INVALID_STATE);
-    ExpectHeard({5}, row.heard);
-    EXPECT_EQ(other.TakeHeard(), row.otherHeard);
+  const std::tuple<SessionListener*, std::string, std::string, std::string> rows[] = {
+      {&other, "", "", "started "},
+      {&other, "", "", "started "},
+      {nullptr, "", "", ""},
+      {nullptr, "", "", ""},
+      {&listener, "", "started ", ""},
+      {&other, "_Event::RemoveListener", "started ", ""},
+      {&other, "_Event::AddListener", "", ""},
+      {&listener, "", "started ", ""}};
+  for (const auto& [next, refusing, heard, otherHeard] : rows) {
+    if (!refusing.empty()) Host::FailCall(refusing.c_str(), E_INVALID_STATE, 1);
+    EXPECT_EQ(manager.SetAudioSessionEventListener(next),
+              refusing.empty() ? E_SUCCESS : E_INVALID_STATE);
+    ExpectHeard({5}, heard);
+    EXPECT_EQ(other.TakeHeard(), otherHeard);
   }
 }
 

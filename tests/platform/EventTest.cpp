@@ -23,8 +23,7 @@
 
 namespace {
 
-using testing::ElementsAre;
-using testing::IsEmpty;
+using namespace testing;
 using namespace Tizen::Base::Runtime;
 
 std::atomic<int> livingArguments{0};
@@ -132,7 +131,7 @@ TEST_F(Delivery, IsInTheOrderOfFiringOverAllEventsOnOneThreadToWhoIsThereAllTheT
     EXPECT_THAT(heard, IsEmpty());
   });
   EXPECT_THAT(heard, ElementsAre("b1", "a1", "b2", "a2", "b3", "b4", "a4", "late4"));
-  EXPECT_THAT(threads, ElementsAre(testing::Ne(std::this_thread::get_id())));
+  EXPECT_THAT(threads, ElementsAre(Ne(std::this_thread::get_id())));
 }
 
 TEST_F(Delivery, GoesOnAfterAListenerLetAnExceptionOut) {
@@ -143,7 +142,7 @@ TEST_F(Delivery, GoesOnAfterAListenerLetAnExceptionOut) {
   event.Fire(1);
   Host::WaitUntilDelivered();
   EXPECT_THAT(testing::internal::GetCapturedStderr(),
-              testing::ContainsRegex("let an exception out: no cake.*\n.*let an exception out\\."));
+              ContainsRegex("let an exception out: no cake.*\n.*let an exception out\\."));
   EXPECT_THAT(listener.heard, ElementsAre(1));
 }
 
@@ -190,7 +189,7 @@ TEST_F(Delivery, FromTwoThreadsKeepsEachOnesOrderWhileListenersAndEventsComeAndG
   Host::WaitUntilDelivered();
   std::vector<int> all(kEvents);
   std::iota(all.begin(), all.end(), 1);
-  EXPECT_THAT(heard, testing::Each(all));
+  EXPECT_THAT(heard, Each(all));
 }
 
 struct SlowListener : Listener {

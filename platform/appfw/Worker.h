@@ -19,7 +19,7 @@ namespace Host {
 /// A thread that delivers what others post, in order.
 ///
 /// One lock guards the queue, what is being delivered, and what its owner keeps beside it; it is
-/// released while others are called. There is one worker for a type of items; it is never destroyed.
+/// released while others are called. There is one worker for a type of items, never destroyed.
 ///
 /// A forked child has no thread, and the lock may be held for ever: there `IsForked` comes before
 /// all else.

@@ -85,6 +85,8 @@ class ServerVisit {
   std::unique_ptr<pa_stream, FreeWith<pa_stream_unref>> stream_;
 };
 
+void EndVisit(gpointer visit) { delete static_cast<ServerVisit*>(visit); }
+
 /// Ends a visit some time after, on the thread of GStreamer's clock.
 void EndLater(std::unique_ptr<ServerVisit> visit, GstClockTime after) {
   const std::unique_ptr<GstClock, FreeWith<gst_object_unref>> clock(gst_system_clock_obtain());
@@ -92,7 +94,7 @@ void EndLater(std::unique_ptr<ServerVisit> visit, GstClockTime after) {
       gst_clock_new_single_shot_id(clock.get(), gst_clock_get_time(clock.get()) + after));
   gst_clock_id_wait_async(
       timer.get(), [](GstClock*, GstClockTime, GstClockID, gpointer) -> gboolean { return TRUE; },
-      visit.release(), [](gpointer ended) { delete static_cast<ServerVisit*>(ended); });
+      visit.release(), EndVisit);
 }
 
 /// Asked before the sink is made, because a sink without a server fails loudly, and late.

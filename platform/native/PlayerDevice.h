@@ -1,64 +1,64 @@
 /// \file
-/// What a device gives for `player.h`: plain functions, which native/PlayerFunctions.cpp calls.
+/// What a device gives for `player.h`, to native/PlayerFunctions.cpp.
 #pragma once
+
+#include "EffectSettings.h"
 
 #include <player.h>
 
 #include <atomic>
 #include <functional>
+#include <memory>
 
-/// Functions that give an `int` return a native code, and tell why by `Host::PlayerFailure`; all
-/// but `Destroy` and `Close` may throw. Pointers and paths have been checked. Several players are
-/// used at once.
+/// All of it may throw, for a failure what `Host::PlayerFailure` gives back. Pointers and paths
+/// have been checked. Several players are used at once.
 namespace PlayerDevice {
 
-/// The device's own part of a player.
-struct Player;
+/// An open file, paused at first. Its operations are called one after the other.
+class File {
+ public:
+  virtual ~File() = default;
 
-int Create(Player*& player);
-void Destroy(Player* player);
+  virtual void Play() = 0;
+  virtual void Pause() = 0;
+  virtual bool IsAtEnd() const = 0;
+  virtual void Seek(long position, bool isExact) = 0;
+  virtual long GetPosition() = 0;
+  virtual long GetDuration() = 0;
+  virtual bool IsKeyFrame() const = 0;
 
-/// \name The open file
-/// Called one after the other for a player; only `Open` and `Close` without a file.
-/// @{
+  /// \param visit returns whether to go on
+  virtual void ListKeyFrames(const std::function<bool(long)>& visit) = 0;
+  virtual void CaptureFrame(player_frame_cb callback, void* userData) = 0;
+  virtual void RenderAudio(const char* path) = 0;
+};
 
-/// \param isUnwanted ends long work on the file when it becomes other than 0
-int Open(Player& player, const char* path, const std::atomic<int>& isUnwanted);
-void Close(Player& player);
-bool IsOpen(const Player& player);
+/// Called for each player, before all else.
+void Start();
 
-int Play(Player& player);
-int Pause(Player& player);
-bool IsAtEnd(const Player& player);
-int Seek(Player& player, long position, bool isExact);
-int GetPosition(Player& player, long& position);
-int GetDuration(Player& player, long& duration);
-bool IsKeyFrame(const Player& player);
-
-/// \param visit returns whether to go on
-int ListKeyFrames(Player& player, const std::function<bool(long)>& visit);
-int CaptureFrame(Player& player, player_frame_cb callback, void* userData);
-int RenderAudio(Player& player, const char* path);
-/// @}
+/// \param effects followed
+/// \param isUnwanted ends long work on the file when it becomes other than 0. Both outlive the file
+std::unique_ptr<File> Open(const char* path, const Native::SharedSettings& effects,
+                           const std::atomic<int>& isUnwanted);
 
 /// \name Sound effects
-/// Called at any time, also during the operations above. Levels are in the range, effects and
-/// presets aren't checked.
+/// Called at any time, also during a file's operations. Effects and presets aren't checked.
 /// @{
+void ListEffects(const std::function<bool(int)>& visit);
+void ListPresets(const std::function<bool(int)>& visit);
+
+/// Of an effect's level.
 struct Range {
   int min;
   int max;
   int initial;
 };
 
-int ListEffects(const std::function<bool(int)>& visit);
-int ListPresets(const std::function<bool(int)>& visit);
+/// Fails for an effect that isn't supported.
+Range GetRange(int effect);
 
-/// Fails for an effect that isn't supported, as the three below.
-int GetRange(int effect, Range& range);
-int SetLevel(Player& player, int effect, int level);
-int GetLevel(Player& player, int effect, int& level);
-int SetPreset(Player& player, int preset);
+/// Fails for a preset that isn't supported.
+void CheckPreset(int preset);
 /// @}
 
 }  // namespace PlayerDevice

@@ -18,7 +18,7 @@ ReasonsOnly::ReasonsOnly() : before_(std::exchange(logsReasonsOnly, true)) {}
 
 ReasonsOnly::~ReasonsOnly() { logsReasonsOnly = before_; }
 
-int PlayerFailure(int error, int line, const char* format, ...) noexcept {
+PlayerError PlayerFailure(int error, int line, const char* format, ...) noexcept {
   char reason[512];
   va_list arguments;
   va_start(arguments, format);
@@ -27,12 +27,12 @@ int PlayerFailure(int error, int line, const char* format, ...) noexcept {
   const result r = ConvertPlayerErrorToResult(error);
   if (logsReasonsOnly) {
     LogReason(kPlayerModule, r, line, "[%s] %s", GetErrorMessage(r), reason);
-    return error;
+    return {error};
   }
   const result before = GetLastResult();
   SysLogExceptionInternal(kPlayerModule, r, "", line, "[%s] %s", GetErrorMessage(r), reason);
   SetLastResult(before);
-  return error;
+  return {error};
 }
 
 }  // namespace Host

@@ -36,10 +36,15 @@ class ReasonsOnly {
   const bool before_;
 };
 
-/// Logs why a player's function fails and gives back \p error, so that a failure is one statement.
-/// The last result belongs to those that call the native functions; it isn't touched. The message
-/// is put behind the code's name: "[E_INVALID_STATE] no file is open".
-int PlayerFailure(int error, int line, const char* format, ...) noexcept
+/// Thrown where a player's function fails; its code is what the function returns.
+struct PlayerError {
+  int code;
+};
+
+/// Logs why a player's function fails and gives back what to throw, so that a failure is one
+/// statement. The last result belongs to those that call the native functions; it isn't touched.
+/// The message is put behind the code's name: "[E_INVALID_STATE] no file is open".
+PlayerError PlayerFailure(int error, int line, const char* format, ...) noexcept
     __attribute__((format(printf, 3, 4)));
 
 }  // namespace Host

@@ -12,15 +12,14 @@ constexpr std::chrono::seconds kIndexLimit{5};
 
 }  // namespace
 
-Film::Film(const char* path, const std::atomic<int>& isUnwanted)
-    : path_(path), isUnwanted_(isUnwanted) {}
-
-void Film::SetContainer(const std::string& demuxer, FilmTime first, FilmTime shift) {
-  own_ = ReadOwnIndex(demuxer, path_.c_str());
-  if (HasOwnOrigin(demuxer)) origin_ = first;
-  if (IsLostBefore(demuxer)) floor_ = first;
-  if (CountsFromZero(demuxer)) excess_ = shift;
-}
+Film::Film(const char* path, const std::atomic<int>& isUnwanted, const std::string& demuxer,
+           FilmTime first, FilmTime shift)
+    : path_(path),
+      isUnwanted_(isUnwanted),
+      own_(ReadOwnIndex(demuxer, path)),
+      origin_(HasOwnOrigin(demuxer) ? first : -1),
+      floor_(IsLostBefore(demuxer) ? first : 0),
+      excess_(CountsFromZero(demuxer) ? shift : 0) {}
 
 FilmTime Film::FindDuration(FilmTime told) {
   if (IsTrusted()) return told - excess_;

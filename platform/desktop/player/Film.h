@@ -15,12 +15,11 @@ namespace Desktop {
 class Film {
  public:
   /// \param isUnwanted ends the search for key frames when it becomes other than 0
-  Film(const char* path, const std::atomic<int>& isUnwanted);
-
   /// \param demuxer what takes the file apart
   /// \param first the position before the first seek
   /// \param shift how much its time stamps are ahead of the times in the film
-  void SetContainer(const std::string& demuxer, FilmTime first, FilmTime shift);
+  Film(const char* path, const std::atomic<int>& isUnwanted, const std::string& demuxer,
+       FilmTime first, FilmTime shift);
 
   /// \return whether the file's own index leads a seek to a key frame.
   bool IsTrusted() const { return own_.isTrusted; }
@@ -59,10 +58,10 @@ class Film {
  private:
   const std::string path_;
   const std::atomic<int>& isUnwanted_;
-  OwnIndex own_;
-  FilmTime origin_ = -1;
-  FilmTime floor_ = 0;
-  FilmTime excess_ = 0;  // of the length that the demuxer tells
+  const OwnIndex own_;
+  const FilmTime origin_;
+  const FilmTime floor_;
+  const FilmTime excess_;  // of the length that the demuxer tells
   std::optional<KeyFrameIndex> index_;
   bool isGivenUp_ = false;
 };

@@ -109,23 +109,22 @@ void HandOver(const Picture& picture, const Turn& turn, player_frame_cb callback
 
 }  // namespace
 
-int HandOver(GstSample* frame, const GstTagList* tags, player_frame_cb callback, void* userData) {
+void HandOver(GstSample* frame, const GstTagList* tags, player_frame_cb callback, void* userData) {
   ErrorPtr error;
   const SamplePtr converted = ConvertToRgb(frame, &error);
   if (converted == nullptr) {
-    return Host::PlayerFailure(PLAYER_ERROR_IO, __LINE__, "the frame can't be converted: %s",
-                               error == nullptr ? "no reason given" : error->message);
+    throw Host::PlayerFailure(PLAYER_ERROR_IO, __LINE__, "the frame can't be converted: %s",
+                              error == nullptr ? "no reason given" : error->message);
   }
   const MappedFrame mapped(converted.get());
   if (!mapped.IsMapped()) {
-    return Host::PlayerFailure(PLAYER_ERROR_IO, __LINE__, "the frame can't be read");
+    throw Host::PlayerFailure(PLAYER_ERROR_IO, __LINE__, "the frame can't be read");
   }
   const GstVideoFrame& picture = mapped.Get();
   HandOver(Picture{static_cast<const unsigned char*>(GST_VIDEO_FRAME_PLANE_DATA(&picture, 0)),
                    GST_VIDEO_FRAME_WIDTH(&picture), GST_VIDEO_FRAME_HEIGHT(&picture),
                    GST_VIDEO_FRAME_PLANE_STRIDE(&picture, 0)},
            FindTurn(tags), callback, userData);
-  return PLAYER_ERROR_NONE;
 }
 
 }  // namespace Desktop

@@ -10,6 +10,6 @@ namespace Desktop {
 /// Converts a decoded frame, square in its pixels and turned as \p tags say, and hands it to
 /// \p callback.
 /// \param tags of the video; may be null
-int HandOver(GstSample* frame, const GstTagList* tags, player_frame_cb callback, void* userData);
+void HandOver(GstSample* frame, const GstTagList* tags, player_frame_cb callback, void* userData);
 
 }  // namespace Desktop

@@ -27,6 +27,13 @@ using TagsPtr = std::unique_ptr<GstTagList, Unref>;
 using ErrorPtr = std::unique_ptr<GError, FreeWith<g_error_free>>;
 using TextPtr = std::unique_ptr<char, FreeWith<g_free>>;
 
+/// Ends an element's streaming threads, and so what they use.
+struct Stop {
+  void operator()(GstElement* element) const { gst_element_set_state(element, GST_STATE_NULL); }
+};
+
+using StreamingPtr = std::unique_ptr<GstElement, Stop>;
+
 /// \return a new element, or null when no plug-in offers one.
 inline ElementPtr MakeElement(const char* factory) {
   GstElement* element = gst_element_factory_make(factory, nullptr);

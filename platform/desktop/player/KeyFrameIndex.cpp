@@ -48,15 +48,8 @@ bool IsVideo(GstPad* pad) {
 /// A pipeline that takes a file apart and throws everything away.
 class Reader {
  public:
-  Reader() : pipeline_(GST_ELEMENT(gst_object_ref_sink(gst_pipeline_new(nullptr)))) {}
-  ~Reader() { Stop(); }
-
-  Reader(const Reader&) = delete;
-  Reader& operator=(const Reader&) = delete;
-
   bool Start(const char* path);
   bool Wait(std::optional<Clock::time_point> deadline, const std::atomic<int>& isUnwanted);
-  void Stop() { gst_element_set_state(pipeline_.get(), GST_STATE_NULL); }
   KeyFrameIndex TakeIndex();
 
  private:
@@ -64,10 +57,11 @@ class Reader {
   static GstPadProbeReturn OnData(GstPad*, GstPadProbeInfo* info, gpointer track);
   unsigned CountBuffers();
 
-  const ElementPtr pipeline_;
+  const ElementPtr pipeline_{MakeElement("pipeline")};
   PipelineWatch watch_{pipeline_.get()};
   std::mutex mutex_;
-  std::deque<Track> tracks_;  // whose places in memory stay
+  std::deque<Track> tracks_;                 // whose places in memory stay
+  StreamingPtr streaming_{pipeline_.get()};  // uses all of them
 };
 
 bool Reader::Start(const char* path) {
@@ -135,6 +129,7 @@ bool Reader::Wait(std::optional<Clock::time_point> deadline, const std::atomic<i
 
 /// Of several pictures the first is taken, as it is played.
 KeyFrameIndex Reader::TakeIndex() {
+  streaming_.reset();
   KeyFrameIndex index;
   for (Track& track : tracks_) {
     if (index.keyFrames.empty()) index.keyFrames = std::move(track.keyFrames);
@@ -153,7 +148,6 @@ std::optional<KeyFrameIndex> ReadKeyFrames(const char* path,
   if (limit) deadline = Clock::now() + *limit;
   Reader reader;
   if (!reader.Start(path) || !reader.Wait(deadline, isUnwanted)) return std::nullopt;
-  reader.Stop();
   return reader.TakeIndex();
 }
 

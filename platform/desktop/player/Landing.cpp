@@ -24,97 +24,85 @@ constexpr int kBrokenLimit = 4;
 
 }  // namespace
 
-int Landing::LandAtOrBefore(FilmTime time, std::optional<Landed>* landed) {
-  std::optional<Landed> reached;
-  bool isFirst = false;
+Landed Landing::LandAtOrBefore(FilmTime time) {
   if (film_.IsTrusted()) {
-    if (const int error = TryContainer(time, &reached, &isFirst)) return error;
-    if (const int error = CorrectByList(time, &reached)) return error;
+    bool isFirst = false;
+    const auto landed = CorrectByList(time, TryContainer(time, &isFirst));
+    if (landed && (landed->time <= time || isFirst)) return *landed;
   }
-  if (!reached || (reached->time > time && !isFirst)) {
-    const int error =
-        film_.FindIndex() != nullptr ? LandByIndex(time, &reached) : LandSomewhere(time, &reached);
-    if (error != PLAYER_ERROR_NONE) return error;
-  }
-  *landed = reached;
-  return PLAYER_ERROR_NONE;
+  return film_.FindIndex() != nullptr ? LandByIndex(time) : LandSomewhere(time);
 }
 
-/// Leaves \p landed empty when the container led to no key frame. It may be one after \p time: the
-/// file's first one, if nothing comes before it.
-int Landing::TryContainer(FilmTime time, std::optional<Landed>* landed, bool* isFirst) {
+/// \return nothing when the container led to no key frame. It may be one after \p time: the file's
+/// first one, if nothing comes before it.
+std::optional<Landed> Landing::TryContainer(FilmTime time, bool* isFirst) {
   FilmTime target = time;
-  std::optional<FilmTime> before;
+  std::optional<Landed> landed;
   // A time between a key frame's decoding and its showing leads to that key frame: once more, then.
   for (int i = 0; i < 2; ++i) {
-    landed->reset();
-    if (const int error = Seek(target, kToKeyFrame, std::nullopt)) return error;
+    Seek(target, kToKeyFrame, std::nullopt);
     const auto shown = pipeline_.GetShown();
-    if (!shown || shown->isBroken) break;
+    if (!shown || shown->isBroken) return std::nullopt;
     const auto keyFrame = pipeline_.GetGate().Find(shown->stamp);
-    if (!keyFrame) break;
-    *landed = Landed{shown->time, true, true, shown->time};
+    if (!keyFrame) return std::nullopt;
     target = shown->time - static_cast<FilmTime>(keyFrame->reordering) - kRounding;
-    *isFirst = target < 0 || before == shown->time;
+    *isFirst = target < 0 || (landed && landed->time == shown->time);
+    landed = Landed{shown->time, true, true, shown->time};
     if (shown->time <= time || *isFirst) break;
-    before = shown->time;
   }
-  return PLAYER_ERROR_NONE;
+  return landed;
 }
 
 /// A demuxer goes to the first key frame of a cluster, though the container lists all of them.
-/// Leaves \p landed empty when there is no key frame at the listed time.
-int Landing::CorrectByList(FilmTime time, std::optional<Landed>* landed) {
+/// \return nothing when there is no key frame at the listed time
+std::optional<Landed> Landing::CorrectByList(FilmTime time, std::optional<Landed> landed) {
   const auto& listed = film_.GetListed();
-  if (listed.empty() || !*landed) return PLAYER_ERROR_NONE;
+  if (listed.empty() || !landed) return landed;
   const auto shown = pipeline_.GetShown();
-  if (!shown) return PLAYER_ERROR_NONE;
+  if (!shown) return landed;
   const FilmTime shift = static_cast<FilmTime>(shown->stamp) - shown->time;
   FilmTime limit = time;
   // Listed times are whole milliseconds: the key frame may be a little later, and then after the
   // time.
   for (int i = 0; i < 2; ++i) {
     const FilmTime keyFrame = *FindAtOrBefore(listed, limit + shift) - shift;
-    if (*landed && Around(keyFrame).Holds((*landed)->time)) break;
-    landed->reset();
-    if (const int error = LandAt(keyFrame, landed)) return error;
-    if (!*landed || (*landed)->time <= time) break;
+    if (Around(keyFrame).Holds(landed->time)) break;
+    landed = LandAt(keyFrame);
+    if (!landed || landed->time <= time) break;
     limit = keyFrame - 1;
   }
-  return PLAYER_ERROR_NONE;
+  return landed;
 }
 
-int Landing::LandByIndex(FilmTime time, std::optional<Landed>* landed) {
+Landed Landing::LandByIndex(FilmTime time) {
   const auto& keyFrames = film_.GetIndex()->keyFrames;
   auto keyFrame = FindAtOrBefore(keyFrames, time);
   for (int broken = 0; broken <= kBrokenLimit; ++broken, --keyFrame) {
-    landed->reset();
-    if (const int error = LandAt(*keyFrame, landed)) return error;
-    if (*landed) return PLAYER_ERROR_NONE;
+    if (const auto landed = LandAt(*keyFrame)) return *landed;
     if (!IsAtGate()) {
-      return Host::PlayerFailure(PLAYER_ERROR_IO, __LINE__,
-                                 "GStreamer doesn't find the key frame at %ld ms",
-                                 static_cast<long>(*keyFrame / GST_MSECOND));
+      throw Host::PlayerFailure(PLAYER_ERROR_IO, __LINE__,
+                                "GStreamer doesn't find the key frame at %ld ms",
+                                static_cast<long>(*keyFrame / GST_MSECOND));
     }
     if (keyFrame == keyFrames.begin()) break;
   }
-  return Host::PlayerFailure(PLAYER_ERROR_IO, __LINE__, "the key frames there are damaged");
+  throw Host::PlayerFailure(PLAYER_ERROR_IO, __LINE__, "the key frames there are damaged");
 }
 
-/// Leaves \p landed empty when the key frame can't be shown.
-int Landing::LandAt(FilmTime keyFrame, std::optional<Landed>* landed) {
+/// \return nothing when the key frame can't be shown
+std::optional<Landed> Landing::LandAt(FilmTime keyFrame) {
   const TimeSpan expected = film_.GetSpan(keyFrame);
   for (FilmTime lead = lead_; lead <= kLastLead; lead = std::max(kFirstLead, 2 * lead)) {
     const FilmTime begin = std::max(keyFrame - lead, std::min(keyFrame, film_.GetFloor()));
-    if (const int error = Seek(begin, kExact, expected)) return error;
+    Seek(begin, kExact, expected);
     const auto shown = pipeline_.GetShown();
     if (IsAtGate() && shown && !shown->isBroken && expected.Holds(shown->time)) {
       lead_ = lead;
-      *landed = Landed{film_.IsTrusted() ? shown->time : keyFrame, true, false, begin};
+      return Landed{film_.IsTrusted() ? shown->time : keyFrame, true, false, begin};
     }
     if (IsAtGate() || begin <= film_.GetFloor()) break;
   }
-  return PLAYER_ERROR_NONE;
+  return std::nullopt;
 }
 
 /// \return whether the key frame that was waited for has come, whole or broken.
@@ -124,27 +112,24 @@ bool Landing::IsAtGate() const {
 }
 
 /// What can be done without knowing the key frames.
-int Landing::LandSomewhere(FilmTime time, std::optional<Landed>* landed) {
-  if (const int error = Seek(time, kToKeyFrame, std::nullopt)) return error;
+Landed Landing::LandSomewhere(FilmTime time) {
+  Seek(time, kToKeyFrame, std::nullopt);
   const auto shown = pipeline_.GetShown();
   if (!shown) {
-    return Host::PlayerFailure(PLAYER_ERROR_IO, __LINE__, "there is no frame near that position");
+    throw Host::PlayerFailure(PLAYER_ERROR_IO, __LINE__, "there is no frame near that position");
   }
-  *landed = Landed{shown->time, IsKeyFrame(*shown), true, shown->time};
-  return PLAYER_ERROR_NONE;
+  return {shown->time, IsKeyFrame(*shown), true, shown->time};
 }
 
-int Landing::Repeat(const Landed& landed, std::optional<Landed>* again) {
+Landed Landing::Repeat(const Landed& landed) {
   if (landed.isKeyFrame) {
-    if (const int error = LandAt(landed.time, again)) return error;
-    if (*again) return PLAYER_ERROR_NONE;
+    if (const auto again = LandAt(landed.time)) return *again;
   }
-  if (const int error = GoTo(landed.time)) return error;
-  *again = Landed{landed.time, landed.isKeyFrame, false, landed.time};
-  return PLAYER_ERROR_NONE;
+  GoTo(landed.time);
+  return {landed.time, landed.isKeyFrame, false, landed.time};
 }
 
-int Landing::GoTo(FilmTime time) { return Seek(time, kExact, std::nullopt); }
+void Landing::GoTo(FilmTime time) { Seek(time, kExact, std::nullopt); }
 
 bool Landing::IsOnKeyFrame() const {
   const auto shown = pipeline_.GetShown();
@@ -161,9 +146,9 @@ bool Landing::IsKeyFrame(const Shown& shown) const {
   return Around(begin).Holds(*FindAtOrBefore(index->keyFrames, begin + kRounding));
 }
 
-int Landing::Seek(FilmTime time, GstSeekFlags manner, std::optional<TimeSpan> first) {
+void Landing::Seek(FilmTime time, GstSeekFlags manner, std::optional<TimeSpan> first) {
   pipeline_.GetGate().Prepare(first);
-  return pipeline_.Move(time, manner);
+  pipeline_.Move(time, manner);
 }
 
 }  // namespace Desktop

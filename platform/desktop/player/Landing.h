@@ -23,25 +23,25 @@ class Landing {
  public:
   Landing(Pipeline& pipeline, Film& film) : pipeline_(pipeline), film_(film) {}
 
-  /// \param landed receives where the pipeline is then; untouched on failure
-  int LandAtOrBefore(FilmTime time, std::optional<Landed>* landed);
+  /// \return where the pipeline is then
+  Landed LandAtOrBefore(FilmTime time);
 
   /// Goes there once more, so that all frames come after it.
-  int Repeat(const Landed& landed, std::optional<Landed>* again);
+  Landed Repeat(const Landed& landed);
 
   /// Goes to the time itself.
-  int GoTo(FilmTime time);
+  void GoTo(FilmTime time);
 
   /// \return whether the picture that is shown since the last seek is a key frame.
   bool IsOnKeyFrame() const;
 
  private:
-  int TryContainer(FilmTime time, std::optional<Landed>* landed, bool* isFirst);
-  int CorrectByList(FilmTime time, std::optional<Landed>* landed);
-  int LandByIndex(FilmTime time, std::optional<Landed>* landed);
-  int LandAt(FilmTime keyFrame, std::optional<Landed>* landed);
-  int LandSomewhere(FilmTime time, std::optional<Landed>* landed);
-  int Seek(FilmTime time, GstSeekFlags manner, std::optional<TimeSpan> first);
+  std::optional<Landed> TryContainer(FilmTime time, bool* isFirst);
+  std::optional<Landed> CorrectByList(FilmTime time, std::optional<Landed> landed);
+  Landed LandByIndex(FilmTime time);
+  std::optional<Landed> LandAt(FilmTime keyFrame);
+  Landed LandSomewhere(FilmTime time);
+  void Seek(FilmTime time, GstSeekFlags manner, std::optional<TimeSpan> first);
   bool IsAtGate() const;
   bool IsKeyFrame(const Shown& shown) const;
 

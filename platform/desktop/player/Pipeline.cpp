@@ -32,43 +32,36 @@ ElementPtr MakeVideoSink() {
   return sink;
 }
 
-}  // namespace
-
-Pipeline::~Pipeline() {
-  if (playbin_ != nullptr) gst_element_set_state(playbin_.get(), GST_STATE_NULL);
-}
-
-int Pipeline::Open(const char* path, GstElement* audioFilter) {
-  if (const int error = Build(path, audioFilter)) return error;
-  return Preroll() ? CheckStreams(path) : ReportOpenFailure(path);
-}
-
-int Pipeline::Build(const char* path, GstElement* audioFilter) {
-  playbin_ = MakeElement("playbin");
-  videoSink_ = MakeVideoSink();
+ElementPtr MakePlaybin(const char* path, GstElement* videoSink, GstElement* audioFilter) {
+  ElementPtr playbin = MakeElement("playbin");
   const ElementPtr audioSink = MakeAudioSink();
-  if (playbin_ == nullptr || videoSink_ == nullptr || audioSink == nullptr ||
+  if (playbin == nullptr || videoSink == nullptr || audioSink == nullptr ||
       audioFilter == nullptr) {
-    return PlayerFailure(PLAYER_ERROR_IO, __LINE__, "GStreamer's base plug-ins are missing");
+    throw PlayerFailure(PLAYER_ERROR_IO, __LINE__, "GStreamer's base plug-ins are missing");
   }
   GError* reason = nullptr;
   const TextPtr uri(gst_filename_to_uri(path, &reason));
   const ErrorPtr error(reason);
   if (uri == nullptr) {
-    return PlayerFailure(PLAYER_ERROR_INVALID_PARAMETER, __LINE__, "\"%s\": %s", path,
-                         error->message);
+    throw PlayerFailure(PLAYER_ERROR_INVALID_PARAMETER, __LINE__, "\"%s\": %s", path,
+                        error->message);
   }
-  g_object_set(playbin_.get(), "uri", uri.get(), "flags", kNativeVideoAndAudio, "video-sink",
-               videoSink_.get(), "audio-sink", audioSink.get(), "audio-filter", audioFilter,
-               nullptr);
-  gate_ = std::make_unique<KeyFrameGate>(playbin_.get());
-  watch_ = std::make_unique<PipelineWatch>(playbin_.get());
-  return PLAYER_ERROR_NONE;
+  g_object_set(playbin.get(), "uri", uri.get(), "flags", kNativeVideoAndAudio, "video-sink",
+               videoSink, "audio-sink", audioSink.get(), "audio-filter", audioFilter, nullptr);
+  return playbin;
+}
+
+}  // namespace
+
+Pipeline::Pipeline(const char* path, GstElement* audioFilter)
+    : videoSink_(MakeVideoSink()), playbin_(MakePlaybin(path, videoSink_.get(), audioFilter)) {
+  if (!Preroll()) FailToOpen(path);
+  CheckStreams(path);
 }
 
 bool Pipeline::Preroll() {
   using Answer = PipelineWatch::Answer;
-  watch_->ExpectAnswer();
+  watch_.ExpectAnswer();
   if (gst_element_set_state(playbin_.get(), GST_STATE_PAUSED) == GST_STATE_CHANGE_FAILURE) {
     return false;
   }
@@ -77,93 +70,92 @@ bool Pipeline::Preroll() {
   for (std::chrono::milliseconds waited{0}; waited < kAnswerLimit; waited += kGlance) {
     // A demuxer that fails as soon as it is plugged in stops, and decodebin may swallow its error.
     idle = IsStreaming(playbin_.get()) ? 0 : idle + 1;
-    answer = watch_->WaitForAnswer(kGlance);
+    answer = watch_.WaitForAnswer(kGlance);
     if (answer != Answer::kNone || idle == kIdleGlances) break;
   }
   return answer == Answer::kDone;
 }
 
-int Pipeline::ReportOpenFailure(const char* path) const {
-  if (!watch_->HasFailed()) {
+void Pipeline::FailToOpen(const char* path) const {
+  if (!watch_.HasFailed()) {
     const bool isTooSlow = IsStreaming(playbin_.get());
-    return PlayerFailure(isTooSlow ? PLAYER_ERROR_IO : PLAYER_ERROR_INVALID_PARAMETER, __LINE__,
-                         "\"%s\" can't be played: GStreamer %s", path,
-                         isTooSlow ? "doesn't answer" : "gave up");
+    throw PlayerFailure(isTooSlow ? PLAYER_ERROR_IO : PLAYER_ERROR_INVALID_PARAMETER, __LINE__,
+                        "\"%s\" can't be played: GStreamer %s", path,
+                        isTooSlow ? "doesn't answer" : "gave up");
   }
-  const PipelineWatch::Failure failure = watch_->GetFailure();
-  return PlayerFailure(failure.atMedia ? PLAYER_ERROR_INVALID_PARAMETER : PLAYER_ERROR_IO, __LINE__,
-                       "\"%s\" can't be played: %s", path, failure.reason.c_str());
+  const PipelineWatch::Failure failure = watch_.GetFailure();
+  throw PlayerFailure(failure.atMedia ? PLAYER_ERROR_INVALID_PARAMETER : PLAYER_ERROR_IO, __LINE__,
+                      "\"%s\" can't be played: %s", path, failure.reason.c_str());
 }
 
 /// A file may end before its first frame: that too is prerolled. Video that starts later than the
 /// sound has none yet either.
-int Pipeline::CheckStreams(const char* path) const {
+void Pipeline::CheckStreams(const char* path) const {
   gboolean isVideoOver = FALSE;
   g_object_get(videoSink_.get(), "eos", &isVideoOver, nullptr);
-  if (HasVideo() ? GetFrame() != nullptr || !isVideoOver : HasAudio()) return PLAYER_ERROR_NONE;
-  return PlayerFailure(PLAYER_ERROR_INVALID_PARAMETER, __LINE__, "\"%s\" holds nothing to play",
-                       path);
+  if (HasVideo() ? GetFrame() != nullptr || !isVideoOver : HasAudio()) return;
+  throw PlayerFailure(PLAYER_ERROR_INVALID_PARAMETER, __LINE__, "\"%s\" holds nothing to play",
+                      path);
 }
 
-int Pipeline::ChangeState(GstState state) {
-  if (const int error = Check()) return error;
-  watch_->ExpectAnswer();
+void Pipeline::ChangeState(GstState state) {
+  Check();
+  watch_.ExpectAnswer();
   switch (gst_element_set_state(playbin_.get(), state)) {
     case GST_STATE_CHANGE_ASYNC: return AwaitAnswer();
     case GST_STATE_CHANGE_FAILURE:
-      if (const int error = Check()) return error;
-      return PlayerFailure(PLAYER_ERROR_IO, __LINE__, "GStreamer can't change to %s",
-                           gst_element_state_get_name(state));
-    default: return PLAYER_ERROR_NONE;
+      Check();
+      throw PlayerFailure(PLAYER_ERROR_IO, __LINE__, "GStreamer can't change to %s",
+                          gst_element_state_get_name(state));
+    default: return;
   }
 }
 
-int Pipeline::Move(FilmTime time, GstSeekFlags manner) {
+void Pipeline::Move(FilmTime time, GstSeekFlags manner) {
   const auto flags = static_cast<GstSeekFlags>(manner | GST_SEEK_FLAG_FLUSH);
-  watch_->ExpectAnswer();
-  watch_->ForgetEnd();
+  watch_.ExpectAnswer();
+  watch_.ForgetEnd();
   const bool isMoving = gst_element_seek_simple(playbin_.get(), GST_FORMAT_TIME, flags, time);
   if (isMoving) return AwaitAnswer();
-  if (const int error = Check()) return error;
-  return PlayerFailure(PLAYER_ERROR_INVALID_OPERATION, __LINE__, "the file can't be sought in");
+  Check();
+  throw PlayerFailure(PLAYER_ERROR_INVALID_OPERATION, __LINE__, "the file can't be sought in");
 }
 
-int Pipeline::AwaitAnswer() {
-  isTimedOut_ = watch_->WaitForAnswer(kAnswerLimit) == PipelineWatch::Answer::kNone;
-  return Check();
+void Pipeline::AwaitAnswer() {
+  isTimedOut_ = watch_.WaitForAnswer(kAnswerLimit) == PipelineWatch::Answer::kNone;
+  Check();
 }
 
-int Pipeline::Check() const {
-  if (watch_->HasFailed()) {
-    return PlayerFailure(PLAYER_ERROR_IO, __LINE__, "the file can't be played on: %s",
-                         watch_->GetFailure().reason.c_str());
+void Pipeline::Check() const {
+  if (watch_.HasFailed()) {
+    throw PlayerFailure(PLAYER_ERROR_IO, __LINE__, "the file can't be played on: %s",
+                        watch_.GetFailure().reason.c_str());
   }
-  if (isTimedOut_) return PlayerFailure(PLAYER_ERROR_IO, __LINE__, "GStreamer doesn't answer");
-  return PLAYER_ERROR_NONE;
+  if (isTimedOut_) throw PlayerFailure(PLAYER_ERROR_IO, __LINE__, "GStreamer doesn't answer");
 }
 
-int Pipeline::GetPosition(FilmTime* position) const {
-  if (const int error = Check()) return error;
+FilmTime Pipeline::GetPosition() const {
+  Check();
   // Of two sinks the pipeline asks the one that is ahead: sound may not have begun yet.
+  FilmTime position = 0;
   const bool isKnown =
-      HasVideo() && gst_element_query_position(videoSink_.get(), GST_FORMAT_TIME, position);
-  return isKnown ? int(PLAYER_ERROR_NONE) : Query(gst_element_query_position, "position", position);
+      HasVideo() && gst_element_query_position(videoSink_.get(), GST_FORMAT_TIME, &position);
+  return isKnown ? position : Query(gst_element_query_position, "position");
 }
 
-int Pipeline::GetDuration(FilmTime* duration) const {
-  return Query(gst_element_query_duration, "duration", duration);
-}
+FilmTime Pipeline::GetDuration() const { return Query(gst_element_query_duration, "duration"); }
 
 bool Pipeline::IsEmpty() const {
   FilmTime duration = 0;
   return gst_element_query_duration(playbin_.get(), GST_FORMAT_TIME, &duration) && duration == 0;
 }
 
-int Pipeline::Query(gboolean (*query)(GstElement*, GstFormat, gint64*), const char* what,
-                    FilmTime* time) const {
-  if (const int error = Check()) return error;
-  if (query(playbin_.get(), GST_FORMAT_TIME, time) && *time >= 0) return PLAYER_ERROR_NONE;
-  return PlayerFailure(PLAYER_ERROR_IO, __LINE__, "the %s isn't known", what);
+FilmTime Pipeline::Query(gboolean (*query)(GstElement*, GstFormat, gint64*),
+                         const char* what) const {
+  Check();
+  FilmTime time = 0;
+  if (query(playbin_.get(), GST_FORMAT_TIME, &time) && time >= 0) return time;
+  throw PlayerFailure(PLAYER_ERROR_IO, __LINE__, "the %s isn't known", what);
 }
 
 /// A pipeline starts to play where its time began, which is now \p ahead.

@@ -17,37 +17,28 @@ struct Shown {
   bool isBroken;  ///< the decoder says so
 };
 
-/// GStreamer's player of one file, with an answer to each order. Failures are logged and given back
-/// as codes of the player interface. After one, or an answer that didn't come in time, all that
-/// follows fails.
+/// GStreamer's player of one file, with an answer to each order. Failures are logged and thrown.
+/// After one, or an answer that didn't come in time, all that follows fails.
 class Pipeline {
  public:
-  Pipeline() = default;
-
-  /// Ends the streaming threads, and so what they use.
-  ~Pipeline();
-
-  Pipeline(const Pipeline&) = delete;
-  Pipeline& operator=(const Pipeline&) = delete;
-
-  /// Builds the pipeline and pauses it where the file starts. To be called once, and first.
+  /// Builds the pipeline and pauses it where the file starts.
   /// \param audioFilter what the sound passes
-  int Open(const char* path, GstElement* audioFilter);
+  Pipeline(const char* path, GstElement* audioFilter);
 
-  int ChangeState(GstState state);
+  void ChangeState(GstState state);
 
   /// Seeks, and waits until that is done.
-  int Move(FilmTime time, GstSeekFlags manner);
+  void Move(FilmTime time, GstSeekFlags manner);
 
-  /// \return a failure of before
-  int Check() const;
-  bool IsBroken() const { return isTimedOut_ || watch_->HasFailed(); }
+  /// Fails after a failure of before.
+  void Check() const;
+  bool IsBroken() const { return isTimedOut_ || watch_.HasFailed(); }
 
   /// \return whether everything has been played.
-  bool HasEnded() const { return watch_->HasEnded(); }
+  bool HasEnded() const { return watch_.HasEnded(); }
 
-  int GetPosition(FilmTime* position) const;
-  int GetDuration(FilmTime* duration) const;
+  FilmTime GetPosition() const;
+  FilmTime GetDuration() const;
 
   /// \return whether the file is known to last no time at all.
   bool IsEmpty() const;
@@ -72,23 +63,22 @@ class Pipeline {
   TagsPtr GetVideoTags() const;
 
   TextPtr GetUri() const;
-  KeyFrameGate& GetGate() { return *gate_; }
+  KeyFrameGate& GetGate() { return gate_; }
 
  private:
-  int Build(const char* path, GstElement* audioFilter);
   bool Preroll();
-  int CheckStreams(const char* path) const;
-  int ReportOpenFailure(const char* path) const;
-  int AwaitAnswer();
-  int Query(gboolean (*query)(GstElement*, GstFormat, gint64*), const char* what,
-            FilmTime* time) const;
+  void CheckStreams(const char* path) const;
+  [[noreturn]] void FailToOpen(const char* path) const;
+  void AwaitAnswer();
+  FilmTime Query(gboolean (*query)(GstElement*, GstFormat, gint64*), const char* what) const;
   gint CountStreams(const char* property) const;
 
-  std::unique_ptr<KeyFrameGate> gate_;
-  std::unique_ptr<PipelineWatch> watch_;
-  ElementPtr videoSink_;
-  ElementPtr playbin_;  // which uses all of them to its end
+  const ElementPtr videoSink_;
+  const ElementPtr playbin_;
+  KeyFrameGate gate_{playbin_.get()};
+  PipelineWatch watch_{playbin_.get()};
   bool isTimedOut_ = false;
+  const StreamingPtr streaming_{playbin_.get()};  // uses all of them
 };
 
 }  // namespace Desktop

@@ -202,19 +202,19 @@ EffectChain::Target EffectChain::FindTarget(const EffectSettings& settings) cons
     const bool isHeld = kBandFrequencies[i] < rate_ * kHighestBand;
     target.gains[i] = isHeld ? preset.gains[i] : 0;
   }
-  target.gains[kBassBand] = settings.Level(kBass);
-  target.gains[kTrebleBand] = settings.Level(kTreble);
+  target.gains[kBassBand] = settings.GetLevel(kBass);
+  target.gains[kTrebleBand] = settings.GetLevel(kTreble);
   if (reverb_ != nullptr) {
-    const int percent = std::min(settings.Level(kReverb) + preset.reverb, 100);
+    const int percent = std::min(settings.GetLevel(kReverb) + preset.reverb, 100);
     target.reverb = percent * kHighestReverbShare / 100;
   }
   // The reverb lowers what it is added to.
   const double gain = std::pow(10, preset.gain / 20) / (1 - target.reverb);
   target.finish.gain = static_cast<float>(gain);
   target.finish.sideGain =
-      static_cast<float>(1 + (kHighestSideGain - 1) * settings.Level(kStereoWidth) / 100);
+      static_cast<float>(1 + (kHighestSideGain - 1) * settings.GetLevel(kStereoWidth) / 100);
   target.finish.compression =
-      static_cast<float>(kHighestCompression * settings.Level(kDynamics) / 100);
+      static_cast<float>(kHighestCompression * settings.GetLevel(kDynamics) / 100);
   return target;
 }
 

@@ -39,10 +39,10 @@ class TemporaryFile {
   const char* GetName() const { return name_.c_str(); }
 
   /// Gives it its final name.
-  int Keep() const {
-    if (std::rename(name_.c_str(), path_.c_str()) == 0) return PLAYER_ERROR_NONE;
-    return PlayerFailure(PLAYER_ERROR_IO, __LINE__, "\"%s\" can't be written: %s", path_.c_str(),
-                         std::strerror(errno));
+  void Keep() const {
+    if (std::rename(name_.c_str(), path_.c_str()) == 0) return;
+    throw PlayerFailure(PLAYER_ERROR_IO, __LINE__, "\"%s\" can't be written: %s", path_.c_str(),
+                        std::strerror(errno));
   }
 
  private:
@@ -53,34 +53,26 @@ class TemporaryFile {
 /// A pipeline from a file to a file: decoder, effects, 16-bit stereo, WAV.
 class Rendering {
  public:
-  explicit Rendering(const EffectSettings& settings) : settings_(settings), effects_(settings_) {}
-  ~Rendering() {
-    // Ends the streaming threads, which use the chain and the watch.
-    if (pipeline_ != nullptr) gst_element_set_state(pipeline_.get(), GST_STATE_NULL);
-  }
+  Rendering(const char* uri, const EffectSettings& settings, const char* path);
 
-  Rendering(const Rendering&) = delete;
-  Rendering& operator=(const Rendering&) = delete;
-
-  int Build(const char* uri, const char* path);
-  int Run();
+  void Run();
 
  private:
   bool Append(GstElement* element);
   static void OnDecoded(GstElement*, GstPad* sound, gpointer rendering);
-  int Await(GstState state);
+  void Await(GstState state);
   gint64 GetBytesWritten() const;
 
   const SharedSettings settings_;
-  const EffectChain effects_;
-  ElementPtr pipeline_;
-  std::unique_ptr<PipelineWatch> watch_;
-  GstElement* last_ = nullptr;  // the pipeline's
+  const EffectChain effects_{settings_};
+  const ElementPtr pipeline_{MakeElement("pipeline")};
+  PipelineWatch watch_{pipeline_.get()};
+  GstElement* last_ = nullptr;                     // the pipeline's
+  const StreamingPtr streaming_{pipeline_.get()};  // uses the chain and the watch
 };
 
-int Rendering::Build(const char* uri, const char* path) {
-  pipeline_.reset(GST_ELEMENT(gst_object_ref_sink(gst_pipeline_new(nullptr))));
-  watch_ = std::make_unique<PipelineWatch>(pipeline_.get());
+Rendering::Rendering(const char* uri, const EffectSettings& settings, const char* path)
+    : settings_(settings) {
   const ElementPtr source = MakeElement("uridecodebin");
   const ElementPtr converter = MakeElement("audioconvert");
   const ElementPtr format = MakeElement("capsfilter");
@@ -92,8 +84,7 @@ int Rendering::Build(const char* uri, const char* path) {
     isComplete = isComplete && Append(element);
   }
   if (!isComplete) {
-    return PlayerFailure(PLAYER_ERROR_IO, __LINE__,
-                         "GStreamer's base or good plug-ins are missing");
+    throw PlayerFailure(PLAYER_ERROR_IO, __LINE__, "GStreamer's base or good plug-ins are missing");
   }
   const CapsPtr sound(gst_caps_new_empty_simple("audio/x-raw"));
   const CapsPtr samples(gst_caps_new_simple("audio/x-raw", "format", G_TYPE_STRING, "S16LE",
@@ -104,7 +95,6 @@ int Rendering::Build(const char* uri, const char* path) {
   g_object_set(converter.get(), "dithering", 0, nullptr);
   g_object_set(format.get(), "caps", samples.get(), nullptr);
   g_object_set(sink.get(), "location", path, nullptr);
-  return PLAYER_ERROR_NONE;
 }
 
 /// Links \p element, if there is one, behind the last one.
@@ -122,24 +112,24 @@ void Rendering::OnDecoded(GstElement*, GstPad* sound, gpointer effects) {
 }
 
 /// Prerolls first, so that what is answered after that is the end.
-int Rendering::Run() {
-  if (const int error = Await(GST_STATE_PAUSED)) return error;
-  return Await(GST_STATE_PLAYING);
+void Rendering::Run() {
+  Await(GST_STATE_PAUSED);
+  Await(GST_STATE_PLAYING);
 }
 
-int Rendering::Await(GstState state) {
-  watch_->ExpectAnswer();
+void Rendering::Await(GstState state) {
+  watch_.ExpectAnswer();
   gst_element_set_state(pipeline_.get(), state);
   Answer answer = Answer::kNone;
   gint64 written = 0;
   do {
     written = GetBytesWritten();
-    answer = watch_->WaitForAnswer(kStandstillLimit);
+    answer = watch_.WaitForAnswer(kStandstillLimit);
   } while (answer == Answer::kNone && GetBytesWritten() != written);
-  if (answer == Answer::kDone) return PLAYER_ERROR_NONE;
-  const std::string reason = watch_->GetFailure().reason;
-  return PlayerFailure(PLAYER_ERROR_IO, __LINE__, "the sound can't be written: %s",
-                       reason.empty() ? "GStreamer stands still" : reason.c_str());
+  if (answer == Answer::kDone) return;
+  const std::string reason = watch_.GetFailure().reason;
+  throw PlayerFailure(PLAYER_ERROR_IO, __LINE__, "the sound can't be written: %s",
+                      reason.empty() ? "GStreamer stands still" : reason.c_str());
 }
 
 gint64 Rendering::GetBytesWritten() const {
@@ -150,19 +140,15 @@ gint64 Rendering::GetBytesWritten() const {
 
 }  // namespace
 
-int RenderAudio(const char* uri, const EffectSettings& settings, const char* path) {
+void RenderAudio(const char* uri, const EffectSettings& settings, const char* path) {
   struct stat status;
   // A device or a pipe would be replaced by a plain file.
   if (stat(path, &status) == 0 && !S_ISREG(status.st_mode)) {
-    return PlayerFailure(PLAYER_ERROR_IO, __LINE__, "\"%s\" is not a plain file", path);
+    throw PlayerFailure(PLAYER_ERROR_IO, __LINE__, "\"%s\" is not a plain file", path);
   }
   const TemporaryFile file(path);
-  {
-    Rendering rendering(settings);
-    if (const int error = rendering.Build(uri, file.GetName())) return error;
-    if (const int error = rendering.Run()) return error;
-  }
-  return file.Keep();
+  Rendering(uri, settings, file.GetName()).Run();
+  file.Keep();
 }
 
 }  // namespace Desktop

@@ -6,8 +6,7 @@
 namespace Desktop {
 
 /// Writes the sound of the media at \p uri, with effects, to the WAV file \p path. Bounded by how
-/// long it stands still, not by how long it takes. \return an error code of the player interface;
-/// failures are logged and leave no file
-int RenderAudio(const char* uri, const EffectSettings& settings, const char* path);
+/// long it stands still, not by how long it takes. Failures are logged, thrown, and leave no file.
+void RenderAudio(const char* uri, const EffectSettings& settings, const char* path);
 
 }  // namespace Desktop

@@ -1,9 +1,10 @@
 /// \file
 #pragma once
 
+#include "native/EffectSettings.h"
+
 #include <array>
 #include <cstddef>
-#include <mutex>
 
 namespace Desktop {
 
@@ -31,39 +32,7 @@ inline constexpr int kNeutralPreset = 1;
 
 inline constexpr bool IsEffect(int effect) { return effect >= kBass && effect <= kDynamics; }
 
-/// What a listener has chosen.
-struct EffectSettings {
-  int Level(int effect) const { return levels[static_cast<std::size_t>(effect - kBass)]; }
-  int& Level(int effect) { return levels[static_cast<std::size_t>(effect - kBass)]; }
-
-  std::array<int, kLevelRanges.size()> levels{};
-  int preset = kNeutralPreset;
-};
-
-/// A player's settings, which its pipeline's threads read while they are changed.
-class SharedSettings {
- public:
-  SharedSettings() = default;
-  explicit SharedSettings(const EffectSettings& settings) : settings_(settings) {}
-
-  EffectSettings Get() const {
-    std::lock_guard lock(mutex_);
-    return settings_;
-  }
-
-  void SetLevel(int effect, int level) {
-    std::lock_guard lock(mutex_);
-    settings_.Level(effect) = level;
-  }
-
-  void SetPreset(int preset) {
-    std::lock_guard lock(mutex_);
-    settings_.preset = preset;
-  }
-
- private:
-  mutable std::mutex mutex_;
-  EffectSettings settings_;
-};
+using Native::EffectSettings;
+using Native::SharedSettings;
 
 }  // namespace Desktop

@@ -46,13 +46,14 @@ int MakeFilmstrip(const Options& options) {
   OutputFile output(options.output);  // before the work, which may take long
   const Filmstrip strip = CollectKeyFrames(movie, options.count);
   const Filmstrip::Size size = strip.Write(output);
+  const char* frames = strip.Count() == 1 ? "frame" : "frames";
   if (strip.Count() < static_cast<std::size_t>(options.count)) {
-    PrintError(fmt::format("note: the video has only {} key frames near the {} positions",
-                           strip.Count(), options.count));
+    PrintError(fmt::format("note: the video has only {} key {} near the {} positions",
+                           strip.Count(), frames, options.count));
   }
   if (output.IsStandardOutput()) return 0;
-  Print(fmt::format("{}: {} {}, {} x {} pixels\n", options.output, strip.Count(),
-                    strip.Count() == 1 ? "frame" : "frames", size.width, size.height));
+  Print(fmt::format("{}: {} {}, {} x {} pixels\n", options.output, strip.Count(), frames,
+                    size.width, size.height));
   return 0;
 }
 

@@ -22,7 +22,7 @@ using Host::WaitUntilDelivered;
 /// read.
 struct Media {
   long duration = 60000;         ///< length in milliseconds
-  long keyFrameInterval = 2000;  ///< in milliseconds, the first key frame being at 0
+  long keyFrameInterval = 2000;  ///< in milliseconds, above 0; the first key frame is at 0
   std::vector<long> keyFrames;   ///< the key frames' positions, ascending, in place of the interval
   bool hasVideo = true;
 };

@@ -640,7 +640,7 @@ TEST(SoundServerFaults, HundredDeathsOfTheServerLeaveNothingBehind) {
   if (IsOnPipeWire()) GTEST_SKIP() << "some of a hundred PipeWires come up keeping no volumes";
   constexpr int kWarmUp = 10;
   constexpr int kDeaths = 100;
-  constexpr std::size_t kNoise = 64 * 1024;  // buffers that libpulse and the C library keep
+  constexpr std::size_t kNoise = 128 * 1024;  // what GStreamer and the C library keep
   SoundServer server;
   server.Start();
   NativeListener listener(NativeListener::kAll);

@@ -40,10 +40,7 @@ struct State {
   }
 };
 
-template <typename Operation>
-auto WithState(Operation operation) {
-  return Global<State>::Use(operation);
-}
+using TheState = Global<State>;
 
 }  // namespace
 
@@ -58,7 +55,7 @@ std::optional<int> OnWatchedCall(const char* function, const char* format, ...) 
   std::vsnprintf(arguments, sizeof arguments, format, list);
   va_end(list);
 
-  return WithState([&](State& state) {
+  return TheState::Use([&](State& state) {
     if (state.recording) {
       try {
         state.calls.push_back(std::string(function) + "(" + arguments + ")");
@@ -73,7 +70,7 @@ std::optional<int> OnWatchedCall(const char* function, const char* format, ...) 
 }  // namespace Internal
 
 void RecordCalls(bool on) {
-  WithState([=](State& state) {
+  TheState::Use([=](State& state) {
     if (on) state.calls.clear();
     state.recording = on;
     state.UpdateWatched();
@@ -81,18 +78,18 @@ void RecordCalls(bool on) {
 }
 
 std::vector<std::string> TakeCalls() {
-  return WithState([](State& state) { return std::exchange(state.calls, {}); });
+  return TheState::Use([](State& state) { return std::exchange(state.calls, {}); });
 }
 
 void FailCall(const char* function, int code, unsigned nth) {
-  WithState([=](State& state) {
+  TheState::Use([=](State& state) {
     state.failures.push_back({function, code, nth});
     state.UpdateWatched();
   });
 }
 
 void ClearFailures() {
-  WithState([](State& state) {
+  TheState::Use([](State& state) {
     state.failures.clear();
     state.UpdateWatched();
   });

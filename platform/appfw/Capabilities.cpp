@@ -6,7 +6,6 @@
 #include <algorithm>
 #include <array>
 #include <atomic>
-#include <cwchar>
 #include <string_view>
 
 namespace {
@@ -20,24 +19,27 @@ struct Answers {
   const std::string_view (&names)[N];
   std::array<std::atomic<result>, N> answers{};
 
-  std::atomic<result>* Find(std::string_view name) {
+  /// \param name in characters of any width
+  template <typename Name>
+  std::atomic<result>* Find(const Name& name) {
     for (std::size_t i = 0; i < N; ++i) {
-      if (names[i] == name) return &answers[i];
+      if (std::equal(name.begin(), name.end(), names[i].begin(), names[i].end())) {
+        return &answers[i];
+      }
     }
     return nullptr;
   }
 
   /// A key is a URI whose path is \p prefix and a name; whose host it names doesn't matter here.
-  result Ask(const wchar_t* key, const wchar_t* prefix, std::size_t prefixLength) const {
-    constexpr std::size_t kSchemeLength = 7;
-    if (std::wcsncmp(key, L"http://", kSchemeLength) != 0) return E_OBJ_NOT_FOUND;
-    const wchar_t* path = std::wcschr(key + kSchemeLength, L'/');
-    if (path == nullptr || std::wcsncmp(path, prefix, prefixLength) != 0) return E_OBJ_NOT_FOUND;
-    const std::wstring_view name(path + prefixLength);
-    for (std::size_t i = 0; i < N; ++i) {
-      if (IsSameText(name, names[i])) return answers[i].load();
+  result Ask(std::wstring_view key, std::wstring_view prefix) {
+    constexpr std::wstring_view kScheme = L"http://";
+    const std::size_t path = key.find(L'/', kScheme.size());
+    if (key.substr(0, kScheme.size()) != kScheme || path == key.npos ||
+        key.substr(path, prefix.size()) != prefix) {
+      return E_OBJ_NOT_FOUND;
     }
-    return E_OBJ_NOT_FOUND;
+    const std::atomic<result>* answer = Find(key.substr(path + prefix.size()));
+    return answer == nullptr ? E_OBJ_NOT_FOUND : answer->load();
   }
 
   bool Set(std::string_view name, result answer) {
@@ -50,15 +52,7 @@ struct Answers {
   void Reset() {
     for (std::atomic<result>& answer : answers) answer = E_SUCCESS;
   }
-
- private:
-  static bool IsSameText(std::wstring_view wide, std::string_view narrow) {
-    return wide.size() == narrow.size() && std::equal(narrow.begin(), narrow.end(), wide.begin());
-  }
 };
-
-constexpr wchar_t kFeaturePrefix[] = L"/tizen/feature/";
-constexpr wchar_t kPrivilegePrefix[] = L"/tizen/privilege/";
 
 Answers<std::size(Host::kFeatures)> features{Host::kFeatures};
 Answers<std::size(Host::kPrivileges)> privileges{Host::kPrivileges};
@@ -88,8 +82,7 @@ result SystemInfo::GetValue(const String& key, bool& value) {
   if (auto failure = Host::OnCall("SystemInfo::GetValue", "%ls", key.GetPointer())) {
     return static_cast<result>(*failure);
   }
-  const result answer =
-      features.Ask(key.GetPointer(), kFeaturePrefix, std::size(kFeaturePrefix) - 1);
+  const result answer = features.Ask(key.GetPointer(), L"/tizen/feature/");
   if (answer != E_SUCCESS && answer != Host::kFeatureAbsent) return answer;
   value = answer == E_SUCCESS;
   return E_SUCCESS;
@@ -104,8 +97,7 @@ result AccessController::CheckPrivilege(const String& privilege) {
           Host::OnCall("AccessController::CheckPrivilege", "%ls", privilege.GetPointer())) {
     return static_cast<result>(*failure);
   }
-  const result answer =
-      privileges.Ask(privilege.GetPointer(), kPrivilegePrefix, std::size(kPrivilegePrefix) - 1);
+  const result answer = privileges.Ask(privilege.GetPointer(), L"/tizen/privilege/");
   return answer == E_OBJ_NOT_FOUND ? E_PRIVILEGE_DENIED : answer;
 }
 

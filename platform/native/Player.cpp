@@ -5,7 +5,7 @@
 #include <Tizen/Media/Player.h>
 #include <Tizen/Media/PlayerImpl.h>
 
-#include <cstring>
+#include <cstddef>
 #include <memory>
 #include <new>
 #include <utility>
@@ -36,7 +36,7 @@ result Call(_PlayerImpl* pImpl, int (*function)(player_h, Parameters...), Argume
 }  // namespace
 
 _PlayerImpl* _PlayerImpl::GetInstance(Player* pPlayer) {
-  Host::OnCall("_PlayerImpl::GetInstance", "%s", "");
+  Host::OnCall("_PlayerImpl::GetInstance");
   return pPlayer == nullptr ? nullptr : pPlayer->__pPlayerImpl;
 }
 
@@ -93,26 +93,18 @@ bool Player::IsAtEnd() const {
   return Call(__pPlayerImpl, player_is_at_end, &atEnd) == E_SUCCESS && atEnd;
 }
 
+// What a callback throws becomes an error code of the function that calls it.
+
 result Player::GetKeyFrames(std::vector<long>& positions) const {
-  struct List {
-    std::vector<long> positions;
-    bool isComplete = true;
-  } list;
+  std::vector<long> found;
   const auto add = [](long position, void* userData) {
-    auto& target = *static_cast<List*>(userData);
-    try {
-      target.positions.push_back(position);
-    } catch (const std::bad_alloc&) {
-      target.isComplete = false;
-    }
-    return target.isComplete;
+    static_cast<std::vector<long>*>(userData)->push_back(position);
+    return true;
   };
   const result r = Call(__pPlayerImpl, player_foreach_key_frame, player_key_frame_cb(add),
-                        static_cast<void*>(&list));
-  if (r != E_SUCCESS) return r;
-  if (!list.isComplete) return Fail(E_OUT_OF_MEMORY, "no memory for the key frames");
-  positions = std::move(list.positions);
-  return E_SUCCESS;
+                        static_cast<void*>(&found));
+  if (r == E_SUCCESS) positions = std::move(found);
+  return r;
 }
 
 result Player::CaptureFrame(VideoFrame& frame) const {
@@ -120,25 +112,16 @@ result Player::CaptureFrame(VideoFrame& frame) const {
   const auto copy = [](const unsigned char* pixels, int width, int height, int stride,
                        void* userData) {
     auto& target = *static_cast<VideoFrame*>(userData);
-    const std::size_t rowSize = static_cast<std::size_t>(width) * 3;
-    try {
-      target.pixels.resize(rowSize * static_cast<std::size_t>(height));
-    } catch (const std::bad_alloc&) {
-      return;
+    for (int row = 0; row < height; ++row, pixels += stride) {
+      target.pixels.insert(target.pixels.end(), pixels, pixels + std::ptrdiff_t{3} * width);
     }
     target.width = width;
     target.height = height;
-    for (int row = 0; row < height; ++row) {
-      std::memcpy(target.pixels.data() + rowSize * static_cast<std::size_t>(row),
-                  pixels + static_cast<std::ptrdiff_t>(stride) * row, rowSize);
-    }
   };
   const result r = Call(__pPlayerImpl, player_capture_frame, player_frame_cb(copy),
                         static_cast<void*>(&captured));
-  if (r != E_SUCCESS) return r;
-  if (captured.width == 0) return Fail(E_OUT_OF_MEMORY, "no memory for a frame");
-  frame = std::move(captured);
-  return E_SUCCESS;
+  if (r == E_SUCCESS) frame = std::move(captured);
+  return r;
 }
 
 result Player::RenderAudio(const char* path) const {

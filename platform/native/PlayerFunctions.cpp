@@ -94,14 +94,14 @@ int List(std::optional<int> failure, player_h player, bool (*callback)(int, void
 extern "C" {
 
 int player_create(player_h* player) {
-  return Run(Host::OnCall(__func__, "%s", ""), player != nullptr, [=] {
+  return Run(Host::OnCall(__func__), player != nullptr, [=] {
     PlayerDevice::Start();
     *player = new player_s;
   });
 }
 
 int player_destroy(player_h player) {
-  return Run(Host::OnCall(__func__, "%s", ""), player != nullptr, [=] {
+  return Run(Host::OnCall(__func__), player != nullptr, [=] {
     if (IsUsable(player)) delete player;  // else what it is made of is the parent's
   });
 }
@@ -116,19 +116,19 @@ int player_open(player_h player, const char* path) {
 }
 
 int player_close(player_h player) {
-  return Run(Host::OnCall(__func__, "%s", ""), IsUsable(player), [=] { CloseFile(*player); });
+  return Run(Host::OnCall(__func__), IsUsable(player), [=] { CloseFile(*player); });
 }
 
 int player_play(player_h player) {
-  return WithFile(Host::OnCall(__func__, "%s", ""), player, true, &File::Play);
+  return WithFile(Host::OnCall(__func__), player, true, &File::Play);
 }
 
 int player_pause(player_h player) {
-  return WithFile(Host::OnCall(__func__, "%s", ""), player, true, &File::Pause);
+  return WithFile(Host::OnCall(__func__), player, true, &File::Pause);
 }
 
 int player_is_at_end(player_h player, bool* at_end) {
-  return WithFile(Host::OnCall(__func__, "%s", ""), player, at_end != nullptr,
+  return WithFile(Host::OnCall(__func__), player, at_end != nullptr,
                   [=](File& file) { *at_end = file.IsAtEnd(); });
 }
 
@@ -139,28 +139,28 @@ int player_seek(player_h player, long position, bool exact) {
 }
 
 int player_get_position(player_h player, long* position) {
-  return WithFile(Host::OnCall(__func__, "%s", ""), player, position != nullptr,
+  return WithFile(Host::OnCall(__func__), player, position != nullptr,
                   [=](File& file) { *position = file.GetPosition(); });
 }
 
 int player_get_duration(player_h player, long* duration) {
-  return WithFile(Host::OnCall(__func__, "%s", ""), player, duration != nullptr,
+  return WithFile(Host::OnCall(__func__), player, duration != nullptr,
                   [=](File& file) { *duration = file.GetDuration(); });
 }
 
 int player_is_key_frame(player_h player, bool* key_frame) {
-  return WithFile(Host::OnCall(__func__, "%s", ""), player, key_frame != nullptr,
+  return WithFile(Host::OnCall(__func__), player, key_frame != nullptr,
                   [=](File& file) { *key_frame = file.IsKeyFrame(); });
 }
 
 int player_foreach_key_frame(player_h player, player_key_frame_cb callback, void* user_data) {
-  return WithFile(Host::OnCall(__func__, "%s", ""), player, callback != nullptr, [=](File& file) {
+  return WithFile(Host::OnCall(__func__), player, callback != nullptr, [=](File& file) {
     file.ListKeyFrames([=](long position) { return callback(position, user_data); });
   });
 }
 
 int player_capture_frame(player_h player, player_frame_cb callback, void* user_data) {
-  return WithFile(Host::OnCall(__func__, "%s", ""), player, callback != nullptr,
+  return WithFile(Host::OnCall(__func__), player, callback != nullptr,
                   [=](File& file) { file.CaptureFrame(callback, user_data); });
 }
 
@@ -175,15 +175,13 @@ int player_render_audio(player_h player, const char* path) {
 int player_audio_effect_foreach_supported_effect(player_h player,
                                                  player_audio_effect_supported_effect_cb callback,
                                                  void* user_data) {
-  return List(Host::OnCall(__func__, "%s", ""), player, callback, user_data,
-              PlayerDevice::ListEffects);
+  return List(Host::OnCall(__func__), player, callback, user_data, PlayerDevice::ListEffects);
 }
 
 int player_audio_effect_foreach_supported_preset(player_h player,
                                                  player_audio_effect_supported_preset_cb callback,
                                                  void* user_data) {
-  return List(Host::OnCall(__func__, "%s", ""), player, callback, user_data,
-              PlayerDevice::ListPresets);
+  return List(Host::OnCall(__func__), player, callback, user_data, PlayerDevice::ListPresets);
 }
 
 int player_audio_effect_set_value(player_h player, audio_effect_e effect, int value) {

@@ -115,25 +115,25 @@ int sound_manager_set_muteall(bool muteall) {
 }
 
 int sound_manager_get_muteall(bool* muteall) {
-  return Contain(Host::OnCall(__func__, "%s", ""), muteall != nullptr,
+  return Contain(Host::OnCall(__func__), muteall != nullptr,
                  [=] { return SoundDevice::GetMuteAll(*muteall); });
 }
 
 int sound_manager_set_volume_changed_cb(sound_manager_volume_changed_cb callback, void* user_data) {
-  return SetCallback(Host::OnCall(__func__, "%s", ""), Kind::kVolume, callback, user_data);
+  return SetCallback(Host::OnCall(__func__), Kind::kVolume, callback, user_data);
 }
 
 int sound_manager_unset_volume_changed_cb(void) {
-  return UnsetCallback(Host::OnCall(__func__, "%s", ""), Kind::kVolume);
+  return UnsetCallback(Host::OnCall(__func__), Kind::kVolume);
 }
 
 int sound_manager_set_muteall_changed_cb(sound_manager_muteall_changed_cb callback,
                                          void* user_data) {
-  return SetCallback(Host::OnCall(__func__, "%s", ""), Kind::kMuteAll, callback, user_data);
+  return SetCallback(Host::OnCall(__func__), Kind::kMuteAll, callback, user_data);
 }
 
 int sound_manager_unset_muteall_changed_cb(void) {
-  return UnsetCallback(Host::OnCall(__func__, "%s", ""), Kind::kMuteAll);
+  return UnsetCallback(Host::OnCall(__func__), Kind::kMuteAll);
 }
 
 int sound_manager_set_session_type(int type) {
@@ -142,7 +142,7 @@ int sound_manager_set_session_type(int type) {
 }
 
 int sound_manager_get_session_type(int* type) {
-  return Contain(Host::OnCall(__func__, "%s", ""), type != nullptr,
+  return Contain(Host::OnCall(__func__), type != nullptr,
                  [=] { return *type = Native::GetSession().type, kOk; });
 }
 
@@ -155,7 +155,7 @@ int sound_manager_set_media_session_option(int first, int second) {
 }
 
 int sound_manager_get_media_session_option(int* first, int* second) {
-  return Contain(Host::OnCall(__func__, "%s", ""), first != nullptr && second != nullptr, [=] {
+  return Contain(Host::OnCall(__func__), first != nullptr && second != nullptr, [=] {
     const Native::Session now = Native::GetSession();
     *first = now.options[0];
     *second = now.options[1];
@@ -165,11 +165,11 @@ int sound_manager_get_media_session_option(int* first, int* second) {
 
 int sound_manager_set_session_interrupted_cb(sound_manager_session_interrupted_cb callback,
                                              void* user_data) {
-  return SetCallback(Host::OnCall(__func__, "%s", ""), Kind::kInterruption, callback, user_data);
+  return SetCallback(Host::OnCall(__func__), Kind::kInterruption, callback, user_data);
 }
 
 int sound_manager_unset_session_interrupted_cb(void) {
-  return UnsetCallback(Host::OnCall(__func__, "%s", ""), Kind::kInterruption);
+  return UnsetCallback(Host::OnCall(__func__), Kind::kInterruption);
 }
 
 int sound_manager_call_session_create(int type, sound_call_session_h* session) {

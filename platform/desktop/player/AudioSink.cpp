@@ -143,38 +143,27 @@ bool ReplaceStream(GstPad* pad, const char* role) {
 
 /// Has a sink's stream follow the session's role. On the streaming thread, which alone uses the
 /// sink's properties by then.
-class RoleFollower {
- public:
-  explicit RoleFollower(GstElement* sink) : sink_(sink) {}
-
-  static GstPadProbeReturn OnSound(GstPad* pad, GstPadProbeInfo* info, gpointer self) {
-    static_cast<RoleFollower*>(self)->Follow(pad, GST_PAD_PROBE_INFO_BUFFER(info));
-    return GST_PAD_PROBE_OK;
+///
+/// A server's sink without a stream falls asleep, and is then two seconds late to the next one:
+/// silence keeps it awake until the new stream is played.
+GstPadProbeReturn FollowRole(GstPad* pad, GstPadProbeInfo* sound, gpointer data) {
+  auto* sink = static_cast<GstElement*>(data);
+  const char* role = GetPlayerRole();
+  if (HasRole(sink, role)) return GST_PAD_PROBE_OK;
+  auto silence = std::make_unique<ServerVisit>();
+  if (silence->Connect()) silence->PlaySilence();
+  AwaitEnd(sink, GST_PAD_PROBE_INFO_BUFFER(sound));
+  SetStreamProperties(sink, role);
+  NoteStreamReplaced();
+  g_object_set_data(G_OBJECT(sink), kReplacing, sink);
+  const bool isReplaced = ReplaceStream(pad, role);
+  g_object_set_data(G_OBJECT(sink), kReplacing, nullptr);
+  if (!isReplaced) {
+    GST_ELEMENT_ERROR(sink, RESOURCE, FAILED, ("The sound server makes no new stream"), (nullptr));
   }
-
- private:
-  /// A server's sink without a stream falls asleep, and is then two seconds late to the next one:
-  /// silence keeps it awake until the new stream is played.
-  void Follow(GstPad* pad, GstBuffer* sound) {
-    const char* role = GetPlayerRole();
-    if (HasRole(sink_, role)) return;
-    auto silence = std::make_unique<ServerVisit>();
-    if (silence->Connect()) silence->PlaySilence();
-    AwaitEnd(sink_, sound);
-    SetStreamProperties(sink_, role);
-    NoteStreamReplaced();
-    g_object_set_data(G_OBJECT(sink_), kReplacing, sink_);
-    const bool isReplaced = ReplaceStream(pad, role);
-    g_object_set_data(G_OBJECT(sink_), kReplacing, nullptr);
-    if (!isReplaced) {
-      GST_ELEMENT_ERROR(sink_, RESOURCE, FAILED, ("The sound server makes no new stream"),
-                        (nullptr));
-    }
-    EndLater(std::move(silence), kSilenceAfter);
-  }
-
-  GstElement* const sink_;
-};
+  EndLater(std::move(silence), kSilenceAfter);
+  return GST_PAD_PROBE_OK;
+}
 
 /// A name of its own for each sink: sinks of one name share a connection, and with it the end of a
 /// server, which would keep new ones from the next server.
@@ -192,9 +181,7 @@ ElementPtr MakePulseSink() {
   g_object_set(sink.get(), "client-name", MakeClientName().c_str(), nullptr);
   SetStreamProperties(sink.get(), GetPlayerRole());
   const PadPtr pad(gst_element_get_static_pad(sink.get(), "sink"));
-  gst_pad_add_probe(pad.get(), GST_PAD_PROBE_TYPE_BUFFER, RoleFollower::OnSound,
-                    new RoleFollower(sink.get()),
-                    [](gpointer self) { delete static_cast<RoleFollower*>(self); });
+  gst_pad_add_probe(pad.get(), GST_PAD_PROBE_TYPE_BUFFER, FollowRole, sink.get(), nullptr);
   return sink;
 }
 

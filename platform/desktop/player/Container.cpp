@@ -68,25 +68,23 @@ struct Element {
   std::uint64_t end;
 };
 
+/// A number tells its length by the first bit that is set, which belongs to it in an id only.
+std::optional<std::uint64_t> ReadVariable(Bytes& file, unsigned longest, bool isId) {
+  const unsigned first = file.ReadByte();
+  unsigned length = 1;
+  while (length <= longest && (first & 0x80U >> (length - 1)) == 0) ++length;
+  if (length > longest) return std::nullopt;
+  const std::uint64_t begin = isId ? first : first & (0x7FU >> (length - 1));
+  return begin << 8 * (length - 1) | file.Read(length - 1);
+}
+
 std::optional<Element> ReadElement(Bytes& file) {
-  const auto readLength = [](unsigned first) {
-    int length = 1;
-    while (length < 9 && (first & 0x80U >> (length - 1)) == 0) ++length;
-    return length;
-  };
-  const unsigned firstOfId = file.ReadByte();
-  const int idLength = readLength(firstOfId);
-  if (idLength > 4) return std::nullopt;
-  std::uint64_t id = firstOfId;
-  for (int i = 1; i < idLength; ++i) id = id << 8U | file.ReadByte();
-  const unsigned firstOfSize = file.ReadByte();
-  const int sizeLength = readLength(firstOfSize);
-  if (sizeLength > 8) return std::nullopt;
-  std::uint64_t size = firstOfSize & (0x7FU >> (sizeLength - 1));
-  for (int i = 1; i < sizeLength; ++i) size = size << 8U | file.ReadByte();
-  if (!file.AreGood()) return std::nullopt;
+  const auto id = ReadVariable(file, 4, true);
+  if (!id) return std::nullopt;
+  const auto size = ReadVariable(file, 8, false);
+  if (!size || !file.AreGood()) return std::nullopt;
   const std::uint64_t begin = file.GetPlace();
-  return Element{id, begin, begin + size};
+  return Element{*id, begin, begin + *size};
 }
 
 constexpr std::uint64_t kSegment = 0x18538067, kSeekHead = 0x114D9B74, kSeek = 0x4DBB,

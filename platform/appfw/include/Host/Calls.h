@@ -50,4 +50,7 @@ std::optional<int> OnCall(const char* function, const char* format, Arguments...
   return Internal::OnWatchedCall(function, format, arguments...);
 }
 
+/// Of a call without arguments.
+inline std::optional<int> OnCall(const char* function) { return OnCall(function, "%s", ""); }
+
 }  // namespace Host

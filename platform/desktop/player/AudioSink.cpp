@@ -180,8 +180,7 @@ ElementPtr MakePulseSink() {
   if (sink == nullptr) return nullptr;
   g_object_set(sink.get(), "client-name", MakeClientName().c_str(), nullptr);
   SetStreamProperties(sink.get(), GetPlayerRole());
-  const PadPtr pad(gst_element_get_static_pad(sink.get(), "sink"));
-  gst_pad_add_probe(pad.get(), GST_PAD_PROBE_TYPE_BUFFER, FollowRole, sink.get(), nullptr);
+  Observe(sink.get(), "sink", GST_PAD_PROBE_TYPE_BUFFER, FollowRole, sink.get());
   return sink;
 }
 
@@ -195,9 +194,7 @@ ElementPtr MakeAudioSink() {
   if (IsSoundServerThere()) {
     if (ElementPtr sink = MakePulseSink()) return sink;
   }
-  ElementPtr sink = MakeElement("fakesink");
-  if (sink != nullptr) g_object_set(sink.get(), "sync", TRUE, nullptr);
-  return sink;
+  return MakeElement("fakesink sync=true");
 }
 
 }  // namespace Desktop

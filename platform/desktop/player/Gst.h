@@ -34,10 +34,25 @@ struct Stop {
 
 using StreamingPtr = std::unique_ptr<GstElement, Stop>;
 
-/// \return a new element, or null when no plug-in offers one.
-inline ElementPtr MakeElement(const char* factory) {
-  GstElement* element = gst_element_factory_make(factory, nullptr);
+/// \param description an element as gst-launch takes it: "fakesink sync=true"
+/// \return a new one, or null when no plug-in offers it
+inline ElementPtr MakeElement(const char* description) {
+  GstElement* element =
+      gst_parse_launch_full(description, nullptr, GST_PARSE_FLAG_FATAL_ERRORS, nullptr);
   return ElementPtr(element == nullptr ? nullptr : GST_ELEMENT(gst_object_ref_sink(element)));
+}
+
+inline bool IsInstalled(const char* factory) {
+  using FactoryPtr = std::unique_ptr<GstElementFactory, FreeWith<gst_object_unref>>;
+  return FactoryPtr(gst_element_factory_find(factory)) != nullptr;
+}
+
+/// Calls \p callback for what comes to a pad of \p element.
+/// \param what values of `GstPadProbeType`
+inline void Observe(GstElement* element, const char* pad, int what, GstPadProbeCallback callback,
+                    gpointer data) {
+  const PadPtr observed(gst_element_get_static_pad(element, pad));
+  gst_pad_add_probe(observed.get(), static_cast<GstPadProbeType>(what), callback, data, nullptr);
 }
 
 }  // namespace Desktop

@@ -77,11 +77,9 @@ bool Reader::Start(const char* path) {
 
 void Reader::OnStream(GstElement*, GstPad* pad, gpointer data) {
   auto* reader = static_cast<Reader*>(data);
-  const ElementPtr sink = MakeElement("fakesink");
+  const ElementPtr sink = MakeElement("fakesink sync=false async=false");
   if (sink == nullptr) return;
-  g_object_set(sink.get(), "sync", FALSE, "async", FALSE, nullptr);
   gst_bin_add(GST_BIN(reader->pipeline_.get()), sink.get());
-  const PadPtr input(gst_element_get_static_pad(sink.get(), "sink"));
   Track* track = nullptr;
   {
     std::lock_guard lock(reader->mutex_);
@@ -89,7 +87,8 @@ void Reader::OnStream(GstElement*, GstPad* pad, gpointer data) {
   }
   track->isVideo = IsVideo(pad);
   constexpr int kWhat = GST_PAD_PROBE_TYPE_BUFFER | GST_PAD_PROBE_TYPE_EVENT_DOWNSTREAM;
-  gst_pad_add_probe(input.get(), static_cast<GstPadProbeType>(kWhat), OnData, track, nullptr);
+  Observe(sink.get(), "sink", kWhat, OnData, track);
+  const PadPtr input(gst_element_get_static_pad(sink.get(), "sink"));
   gst_pad_link(pad, input.get());
   gst_element_sync_state_with_parent(sink.get());
 }

@@ -1,7 +1,8 @@
 // What the player needs: plug-ins of GStreamer.
 
+#include "Gst.h"
+
 #include <Host/Needs.h>
-#include <gst/gst.h>
 
 #include <iterator>
 #include <string>
@@ -53,12 +54,6 @@ constexpr Element kElements[] = {
     {"flacdec", "sound: FLAC", kGood},
 };
 
-bool IsInstalled(const char* factory) {
-  GstElementFactory* found = gst_element_factory_find(factory);
-  if (found != nullptr) gst_object_unref(found);
-  return found != nullptr;
-}
-
 }  // namespace
 
 std::vector<Need> ListPlayerNeeds() {
@@ -67,7 +62,7 @@ std::vector<Need> ListPlayerNeeds() {
   }
   std::vector<Need> needs;
   for (const Element& element : kElements) {
-    needs.push_back({element.what, IsInstalled(element.factory),
+    needs.push_back({element.what, Desktop::IsInstalled(element.factory),
                      std::string("apt install ") + element.package});
   }
   return needs;

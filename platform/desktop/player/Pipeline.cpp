@@ -23,13 +23,7 @@ constexpr int kNativeVideoAndAudio = 0x1 | 0x40 | 0x2;
 /// \return a sink that shows nothing, in real time, and keeps the frame that it would show. It
 /// takes frames in the system's memory only, so that they can be read whichever decoder makes them.
 ElementPtr MakeVideoSink() {
-  ElementPtr sink = MakeElement("appsink");
-  const CapsPtr anyFrame(gst_caps_new_empty_simple("video/x-raw"));
-  if (sink != nullptr) {
-    g_object_set(sink.get(), "caps", anyFrame.get(), "max-buffers", 1, "drop", TRUE, "wait-on-eos",
-                 FALSE, nullptr);
-  }
-  return sink;
+  return MakeElement("appsink caps=video/x-raw max-buffers=1 drop=true wait-on-eos=false");
 }
 
 ElementPtr MakePlaybin(const char* path, GstElement* videoSink, GstElement* audioFilter) {

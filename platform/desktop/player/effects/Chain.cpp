@@ -46,11 +46,7 @@ constexpr double kHighestCompression = 2.0 / 3;  // three dB become one
 constexpr std::size_t kFrameSize = 2 * sizeof(float);
 
 bool Find(const char* factory) {
-  GstElementFactory* found = gst_element_factory_find(factory);
-  if (found != nullptr) {
-    gst_object_unref(found);
-    return true;
-  }
+  if (IsInstalled(factory)) return true;
   SysLogInternal(Host::kPlayerModule, "", __LINE__,
                  "GStreamer's element \"%s\" is missing: effects made with it aren't supported",
                  factory);
@@ -89,18 +85,17 @@ bool IsPresetSupported(int preset) {
 EffectChain::EffectChain(const SharedSettings& settings)
     : settings_(settings), bin_(GST_ELEMENT(gst_object_ref_sink(gst_bin_new("effects")))) {
   GstElement* converter = Append(MakeElement("audioconvert"));
-  GstElement* format = Append(MakeElement("capsfilter"));
+  GstElement* format =
+      Append(MakeElement("capsfilter caps=audio/x-raw,format=F32LE,layout=interleaved,channels=2"));
   if (converter == nullptr || format == nullptr) {
     bin_.reset();
     return;
   }
-  const CapsPtr stereo(gst_caps_from_string(
-      "audio/x-raw, format=(string)F32LE, layout=(string)interleaved, channels=(int)2"));
-  g_object_set(format, "caps", stereo.get(), nullptr);
-  Observe(format, GST_PAD_PROBE_TYPE_BUFFER | GST_PAD_PROBE_TYPE_EVENT_DOWNSTREAM, OnInput);
+  Observe(format, "src", GST_PAD_PROBE_TYPE_BUFFER | GST_PAD_PROBE_TYPE_EVENT_DOWNSTREAM, OnInput,
+          this);
   if (HasEqualizer()) AddEqualizer();
   if (HasReverb()) AddReverb();
-  Observe(last_, GST_PAD_PROBE_TYPE_BUFFER, OnOutput);
+  Observe(last_, "src", GST_PAD_PROBE_TYPE_BUFFER, OnOutput, this);
   if (GstElement* limiter = Append(Limiter::MakeElement())) limiter_.Attach(limiter);
   Expose(converter, "sink");
   Expose(last_, "src");
@@ -134,12 +129,6 @@ void EffectChain::AddReverb() {
   if (reverb_ == nullptr) return;
   g_object_set(reverb_, "level", 0.0, "room-size", kRoomSize, "damping", kDamping, nullptr);
   gst_base_transform_set_passthrough(GST_BASE_TRANSFORM(reverb_), TRUE);
-}
-
-/// Calls \p callback for what leaves \p element.
-void EffectChain::Observe(GstElement* element, int what, GstPadProbeCallback callback) {
-  const PadPtr pad(gst_element_get_static_pad(element, "src"));
-  gst_pad_add_probe(pad.get(), static_cast<GstPadProbeType>(what), callback, this, nullptr);
 }
 
 void EffectChain::Expose(GstElement* element, const char* name) {

@@ -55,7 +55,6 @@ class EffectChain {
   GstElement* Append(ElementPtr element);
   void AddEqualizer();
   void AddReverb();
-  void Observe(GstElement* element, int what, GstPadProbeCallback callback);
   void Expose(GstElement* element, const char* name);
 
   static GstPadProbeReturn OnInput(GstPad*, GstPadProbeInfo* info, gpointer chain);

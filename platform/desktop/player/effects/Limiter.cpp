@@ -41,12 +41,8 @@ class Samples {
 
 std::size_t CountFrames(GstBuffer* buffer) { return gst_buffer_get_size(buffer) / kFrameSize; }
 
-bool IsInstalled() {
-  GstElementFactory* found = gst_element_factory_find(kFactory);
-  if (found != nullptr) {
-    gst_object_unref(found);
-    return true;
-  }
+bool Find() {
+  if (IsInstalled(kFactory)) return true;
   SysLogInternal(Host::kPlayerModule, "", __LINE__,
                  "GStreamer's element \"%s\" is missing: effects that make the sound louder than "
                  "full scale cut it off",
@@ -57,7 +53,7 @@ bool IsInstalled() {
 }  // namespace
 
 ElementPtr Limiter::MakeElement() {
-  static const bool isInstalled = IsInstalled();
+  static const bool isInstalled = Find();
   return isInstalled ? Desktop::MakeElement(kFactory) : nullptr;
 }
 
@@ -66,14 +62,9 @@ void Limiter::Attach(GstElement* element) {
   g_object_set(element, "limit", kCeiling, "release-time", kReleaseSeconds, nullptr);
   constexpr int kData = GST_PAD_PROBE_TYPE_BUFFER | GST_PAD_PROBE_TYPE_EVENT_DOWNSTREAM;
   constexpr int kAnswers = GST_PAD_PROBE_TYPE_QUERY_UPSTREAM | GST_PAD_PROBE_TYPE_PULL;
-  const PadPtr input(gst_element_get_static_pad(element, "sink"));
-  const PadPtr output(gst_element_get_static_pad(element, "src"));
-  const auto observe = [this](const PadPtr& pad, int what, GstPadProbeCallback callback) {
-    gst_pad_add_probe(pad.get(), static_cast<GstPadProbeType>(what), callback, this, nullptr);
-  };
-  observe(input, kData | GST_PAD_PROBE_TYPE_EVENT_FLUSH, OnInput);
-  observe(output, GST_PAD_PROBE_TYPE_BUFFER, OnOutput);
-  observe(output, kAnswers, OnLatencyQuery);
+  Observe(element, "sink", kData | GST_PAD_PROBE_TYPE_EVENT_FLUSH, OnInput, this);
+  Observe(element, "src", GST_PAD_PROBE_TYPE_BUFFER, OnOutput, this);
+  Observe(element, "src", kAnswers, OnLatencyQuery, this);
 }
 
 GstPadProbeReturn Limiter::OnInput(GstPad* pad, GstPadProbeInfo* info, gpointer limiter) {

@@ -50,6 +50,19 @@ class TemporaryFile {
   std::string name_;
 };
 
+ElementPtr MakePipeline(GstElement* effects) {
+  // Sound that isn't changed comes out as it was: without dither, which is noise.
+  ElementPtr pipeline = MakeElement(
+      "uridecodebin name=source caps=audio/x-raw expose-all-streams=false "
+      "audioconvert name=converter dithering=none ! audio/x-raw,format=S16LE,channels=2 "
+      "! wavenc ! filesink name=sink");
+  if (pipeline == nullptr || effects == nullptr) {
+    throw PlayerFailure(PLAYER_ERROR_IO, __LINE__, "GStreamer's base or good plug-ins are missing");
+  }
+  gst_bin_add(GST_BIN(pipeline.get()), effects);
+  return pipeline;
+}
+
 /// A pipeline from a file to a file: decoder, effects, 16-bit stereo, WAV.
 class Rendering {
  public:
@@ -58,51 +71,30 @@ class Rendering {
   void Run();
 
  private:
-  bool Append(GstElement* element);
-  static void OnDecoded(GstElement*, GstPad* sound, gpointer rendering);
+  ElementPtr Find(const char* name) const;
+  static void OnDecoded(GstElement*, GstPad* sound, gpointer effects);
   void Await(GstState state);
   gint64 GetBytesWritten() const;
 
   const SharedSettings settings_;
   const EffectChain effects_{settings_};
-  const ElementPtr pipeline_{MakeElement("pipeline")};
+  const ElementPtr pipeline_{MakePipeline(effects_.GetElement())};
+  const ElementPtr sink_{Find("sink")};
   PipelineWatch watch_{pipeline_.get()};
-  GstElement* last_ = nullptr;                     // the pipeline's
   const StreamingPtr streaming_{pipeline_.get()};  // uses the chain and the watch
 };
 
 Rendering::Rendering(const char* uri, const EffectSettings& settings, const char* path)
     : settings_(settings) {
-  const ElementPtr source = MakeElement("uridecodebin");
-  const ElementPtr converter = MakeElement("audioconvert");
-  const ElementPtr format = MakeElement("capsfilter");
-  const ElementPtr encoder = MakeElement("wavenc");
-  const ElementPtr sink = MakeElement("filesink");
-  bool isComplete = source != nullptr && gst_bin_add(GST_BIN(pipeline_.get()), source.get());
-  for (GstElement* element :
-       {effects_.GetElement(), converter.get(), format.get(), encoder.get(), sink.get()}) {
-    isComplete = isComplete && Append(element);
-  }
-  if (!isComplete) {
-    throw PlayerFailure(PLAYER_ERROR_IO, __LINE__, "GStreamer's base or good plug-ins are missing");
-  }
-  const CapsPtr sound(gst_caps_new_empty_simple("audio/x-raw"));
-  const CapsPtr samples(gst_caps_new_simple("audio/x-raw", "format", G_TYPE_STRING, "S16LE",
-                                            "channels", G_TYPE_INT, 2, nullptr));
-  g_object_set(source.get(), "uri", uri, "caps", sound.get(), "expose-all-streams", FALSE, nullptr);
+  gst_element_link(effects_.GetElement(), Find("converter").get());
+  const ElementPtr source = Find("source");
+  g_object_set(source.get(), "uri", uri, nullptr);
   g_signal_connect(source.get(), "pad-added", G_CALLBACK(OnDecoded), effects_.GetElement());
-  // Sound that isn't changed comes out as it was, without noise added.
-  g_object_set(converter.get(), "dithering", 0, nullptr);
-  g_object_set(format.get(), "caps", samples.get(), nullptr);
-  g_object_set(sink.get(), "location", path, nullptr);
+  g_object_set(sink_.get(), "location", path, nullptr);
 }
 
-/// Links \p element, if there is one, behind the last one.
-bool Rendering::Append(GstElement* element) {
-  if (element == nullptr || !gst_bin_add(GST_BIN(pipeline_.get()), element)) return false;
-  if (last_ != nullptr && !gst_element_link(last_, element)) return false;
-  last_ = element;
-  return true;
+ElementPtr Rendering::Find(const char* name) const {
+  return ElementPtr(gst_bin_get_by_name(GST_BIN(pipeline_.get()), name));
 }
 
 /// Of several sounds the first is taken.
@@ -134,7 +126,7 @@ void Rendering::Await(GstState state) {
 
 gint64 Rendering::GetBytesWritten() const {
   gint64 bytes = 0;
-  gst_element_query_position(last_, GST_FORMAT_BYTES, &bytes);
+  gst_element_query_position(sink_.get(), GST_FORMAT_BYTES, &bytes);
   return bytes;
 }
 

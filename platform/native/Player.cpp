@@ -33,6 +33,13 @@ result Call(_PlayerImpl* pImpl, int (*function)(player_h, Parameters...), Argume
   return Report(function(pImpl->__hPlayer, arguments...));
 }
 
+/// \return what a native function tells of the player, or \p otherwise when it fails
+template <typename Value>
+Value Ask(_PlayerImpl* pImpl, int (*function)(player_h, Value*), Value otherwise) {
+  Value told = otherwise;
+  return Call(pImpl, function, &told) == E_SUCCESS ? told : otherwise;
+}
+
 }  // namespace
 
 _PlayerImpl* _PlayerImpl::GetInstance(Player* pPlayer) {
@@ -73,25 +80,13 @@ result Player::Play() { return Call(__pPlayerImpl, player_play); }
 
 result Player::Pause() { return Call(__pPlayerImpl, player_pause); }
 
-long Player::GetPosition() const {
-  long position = -1;
-  return Call(__pPlayerImpl, player_get_position, &position) == E_SUCCESS ? position : -1;
-}
+long Player::GetPosition() const { return Ask(__pPlayerImpl, player_get_position, -1L); }
 
-long Player::GetDuration() const {
-  long duration = -1;
-  return Call(__pPlayerImpl, player_get_duration, &duration) == E_SUCCESS ? duration : -1;
-}
+long Player::GetDuration() const { return Ask(__pPlayerImpl, player_get_duration, -1L); }
 
-bool Player::IsKeyFrame() const {
-  bool keyFrame = false;
-  return Call(__pPlayerImpl, player_is_key_frame, &keyFrame) == E_SUCCESS && keyFrame;
-}
+bool Player::IsKeyFrame() const { return Ask(__pPlayerImpl, player_is_key_frame, false); }
 
-bool Player::IsAtEnd() const {
-  bool atEnd = false;
-  return Call(__pPlayerImpl, player_is_at_end, &atEnd) == E_SUCCESS && atEnd;
-}
+bool Player::IsAtEnd() const { return Ask(__pPlayerImpl, player_is_at_end, false); }
 
 // What a callback throws becomes an error code of the function that calls it.
 

@@ -5,6 +5,7 @@
 #include <gst/video/video.h>
 
 #include <algorithm>
+#include <memory>
 #include <vector>
 
 namespace Desktop {
@@ -12,38 +13,17 @@ namespace {
 
 constexpr GstClockTime kConversionLimit = 5 * GST_SECOND;
 
-/// A frame in packed red, green, blue with square pixels, or null with \p error set.
-SamplePtr ConvertToRgb(GstSample* frame, ErrorPtr* error) {
+/// \return a frame in packed red, green, blue with square pixels.
+SamplePtr ConvertToRgb(GstSample* frame) {
   const CapsPtr rgb(gst_caps_new_simple("video/x-raw", "format", G_TYPE_STRING, "RGB",
                                         "pixel-aspect-ratio", GST_TYPE_FRACTION, 1, 1, nullptr));
   GError* reason = nullptr;
   SamplePtr converted(gst_video_convert_sample(frame, rgb.get(), kConversionLimit, &reason));
-  error->reset(reason);
-  return converted;
+  const ErrorPtr error(reason);
+  if (converted != nullptr) return converted;
+  throw Host::PlayerFailure(PLAYER_ERROR_IO, __LINE__, "the frame can't be converted: %s",
+                            error == nullptr ? "no reason given" : error->message);
 }
-
-/// Gives reading access to a sample's pixels.
-class MappedFrame {
- public:
-  explicit MappedFrame(GstSample* sample) {
-    GstVideoInfo info;
-    isMapped_ = gst_video_info_from_caps(&info, gst_sample_get_caps(sample)) &&
-                gst_video_frame_map(&frame_, &info, gst_sample_get_buffer(sample), GST_MAP_READ);
-  }
-  ~MappedFrame() {
-    if (isMapped_) gst_video_frame_unmap(&frame_);
-  }
-
-  MappedFrame(const MappedFrame&) = delete;
-  MappedFrame& operator=(const MappedFrame&) = delete;
-
-  bool IsMapped() const { return isMapped_; }
-  const GstVideoFrame& Get() const { return frame_; }
-
- private:
-  GstVideoFrame frame_;
-  bool isMapped_ = false;
-};
 
 /// How a picture is turned upright: its rows become columns, then it is mirrored.
 struct Turn {
@@ -110,17 +90,14 @@ void HandOver(const Picture& picture, const Turn& turn, player_frame_cb callback
 }  // namespace
 
 void HandOver(GstSample* frame, const GstTagList* tags, player_frame_cb callback, void* userData) {
-  ErrorPtr error;
-  const SamplePtr converted = ConvertToRgb(frame, &error);
-  if (converted == nullptr) {
-    throw Host::PlayerFailure(PLAYER_ERROR_IO, __LINE__, "the frame can't be converted: %s",
-                              error == nullptr ? "no reason given" : error->message);
-  }
-  const MappedFrame mapped(converted.get());
-  if (!mapped.IsMapped()) {
+  const SamplePtr converted = ConvertToRgb(frame);
+  GstVideoInfo info;
+  GstVideoFrame picture;
+  if (!gst_video_info_from_caps(&info, gst_sample_get_caps(converted.get())) ||
+      !gst_video_frame_map(&picture, &info, gst_sample_get_buffer(converted.get()), GST_MAP_READ)) {
     throw Host::PlayerFailure(PLAYER_ERROR_IO, __LINE__, "the frame can't be read");
   }
-  const GstVideoFrame& picture = mapped.Get();
+  const std::unique_ptr<GstVideoFrame, FreeWith<gst_video_frame_unmap>> mapped(&picture);
   HandOver(Picture{static_cast<const unsigned char*>(GST_VIDEO_FRAME_PLANE_DATA(&picture, 0)),
                    GST_VIDEO_FRAME_WIDTH(&picture), GST_VIDEO_FRAME_HEIGHT(&picture),
                    GST_VIDEO_FRAME_PLANE_STRIDE(&picture, 0)},

@@ -75,29 +75,24 @@ void Playback::Seek(long position, bool isExact) {
     Land(film_.GetOrigin() + position * GST_MSECOND + kWithinMillisecond, isExact);
   } catch (const Host::PlayerError&) {
     // A gate that waits for a key frame in vain stays closed until the next seek.
-    if (wasSomewhere && !pipeline_.IsBroken()) Succeeds([&] { GoBack(before); });
+    if (wasSomewhere && !pipeline_.IsBroken()) Succeeds([&] { GoTo(before); });
     Succeeds(playOn);
     throw;
   }
   playOn();
 }
 
-/// To where a seek that failed began.
-void Playback::GoBack(FilmTime time) {
-  landing_.GoTo(time);
-  isKeyFrame_ = landing_.IsOnKeyFrame();
-}
-
 void Playback::Land(FilmTime time, bool isExact) {
   landed_.reset();
   isKeyFrame_ = false;
-  if (isExact) {
-    landing_.GoTo(time);
-    isKeyFrame_ = landing_.IsOnKeyFrame();  // at the very end there is no frame
-  } else {
-    landed_ = landing_.LandAtOrBefore(time);
-    isKeyFrame_ = landed_->isKeyFrame;
-  }
+  if (isExact) return GoTo(time);
+  landed_ = landing_.LandAtOrBefore(time);
+  isKeyFrame_ = landed_->isKeyFrame;
+}
+
+void Playback::GoTo(FilmTime time) {
+  landing_.GoTo(time);
+  isKeyFrame_ = landing_.IsOnKeyFrame();  // at the very end there is no frame
 }
 
 void Playback::CheckVideo() const {

@@ -49,7 +49,7 @@ class Playback : public PlayerDevice::File {
  private:
   void CheckVideo() const;
   void Land(FilmTime time, bool isExact);
-  void GoBack(FilmTime time);
+  void GoTo(FilmTime time);
   FilmTime FindTime() const;
   void LeaveLanding();
   void Rewind();

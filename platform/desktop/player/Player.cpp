@@ -32,6 +32,18 @@ void CheckFile(const char* path) {
   }
 }
 
+/// Of an effect or a preset.
+void CheckSupport(const char* what, int number, bool exists, bool isSupported) {
+  if (!exists) {
+    throw PlayerFailure(PLAYER_ERROR_INVALID_PARAMETER, __LINE__, "there is no %s %d", what,
+                        number);
+  }
+  if (!isSupported) {
+    throw PlayerFailure(PLAYER_ERROR_INVALID_OPERATION, __LINE__,
+                        "the %s %d needs an element of GStreamer that is missing", what, number);
+  }
+}
+
 }  // namespace
 
 namespace PlayerDevice {
@@ -70,25 +82,13 @@ void ListPresets(const std::function<bool(int)>& visit) {
 }
 
 Range GetRange(int effect) {
-  if (!Desktop::IsEffect(effect)) {
-    throw PlayerFailure(PLAYER_ERROR_INVALID_PARAMETER, __LINE__, "there is no effect %d", effect);
-  }
-  if (!Desktop::IsEffectSupported(effect)) {
-    throw PlayerFailure(PLAYER_ERROR_INVALID_OPERATION, __LINE__,
-                        "the effect %d needs an element of GStreamer that is missing", effect);
-  }
+  CheckSupport("effect", effect, Desktop::IsEffect(effect), Desktop::IsEffectSupported(effect));
   const auto [min, max] = Desktop::kLevelRanges[static_cast<std::size_t>(effect - Desktop::kBass)];
   return {min, max, Desktop::kDefaultLevel};
 }
 
 void CheckPreset(int preset) {
-  if (!Desktop::IsPreset(preset)) {
-    throw PlayerFailure(PLAYER_ERROR_INVALID_PARAMETER, __LINE__, "there is no preset %d", preset);
-  }
-  if (!Desktop::IsPresetSupported(preset)) {
-    throw PlayerFailure(PLAYER_ERROR_INVALID_OPERATION, __LINE__,
-                        "the preset %d needs an element of GStreamer that is missing", preset);
-  }
+  CheckSupport("preset", preset, Desktop::IsPreset(preset), Desktop::IsPresetSupported(preset));
 }
 
 }  // namespace PlayerDevice

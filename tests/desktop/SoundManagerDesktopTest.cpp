@@ -436,6 +436,24 @@ TEST_F(SoundManagerDesktop, SessionDecidesTheRoleOfPlayersStreams) {
   EXPECT_EQ(listener.Take(), "code 6");
 }
 
+TEST_F(SoundManagerDesktop, PlayerPlaysOnThoughTheServerWasSlowToPauseIt) {
+  Tizen::Media::Player player;
+  ASSERT_EQ(player.Construct(), E_SUCCESS);
+  ASSERT_EQ(player.OpenFile(Film().c_str()), E_SUCCESS);
+  ASSERT_EQ(player.Play(), E_SUCCESS);
+  for (long position = 200; position <= 2000; position += 200) {
+    ASSERT_TRUE(ComesTrue([&] { return player.GetPosition() > position; })) << position;
+    server.Signal(SIGSTOP);
+    std::thread slow([&] {
+      std::this_thread::sleep_for(std::chrono::milliseconds(30));
+      server.Signal(SIGCONT);
+    });
+    EXPECT_EQ(player.Pause(), E_SUCCESS);
+    slow.join();
+    ASSERT_EQ(player.Play(), E_SUCCESS);
+  }
+}
+
 /// Runs \p call and expects \p code at once, that is without the bound of a wait that never ends.
 void ExpectSoon(int code, const std::function<int()>& call) {
   const auto begin = std::chrono::steady_clock::now();

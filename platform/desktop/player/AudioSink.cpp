@@ -2,7 +2,7 @@
 
 #include "desktop/sound/Session.h"
 
-#include <gst/base/gstbasesink.h>
+#include <gst/audio/gstaudiobasesink.h>
 #include <pulse/pulseaudio.h>
 
 #include <algorithm>
@@ -165,6 +165,52 @@ GstPadProbeReturn FollowRole(GstPad* pad, GstPadProbeInfo* sound, gpointer data)
   return GST_PAD_PROBE_OK;
 }
 
+/// A pulsesink's clock, which stands still for a moment when a pause ends.
+///
+/// libpulse 16 takes a stream to run only from some time after it was told to: as long as the last
+/// message took to the server. Asked for the stream's time before, it tells one of some 580,000
+/// years, and never an earlier one afterwards: the player would stand still for good.
+class SinkClock {
+ public:
+  /// Takes the place of the sink's own one.
+  static void Install(GstAudioBaseSink* sink) {
+    GstClock*& provided = sink->provided_clock;
+    auto clock = std::make_unique<SinkClock>(sink, GST_AUDIO_CLOCK(provided));
+    provided = gst_audio_clock_new("zelkora", GetTime, clock.release(), Free);
+  }
+
+  /// Takes over \p own.
+  SinkClock(const GstAudioBaseSink* sink, GstAudioClock* own) : sink_(sink), own_(own) {}
+
+ private:
+  /// Far longer than a message takes, and too short to be seen.
+  static constexpr gint64 kMoment = 100 * G_TIME_SPAN_MILLISECOND;
+
+  static constexpr gint64 kPaused = -1;
+
+  /// \return the time; none: the one told last
+  static GstClockTime GetTime(GstClock*, gpointer self) {
+    auto& clock = *static_cast<SinkClock*>(self);
+    GstAudioRingBuffer* stream = clock.sink_->ringbuffer;
+    if (stream == nullptr) return GST_CLOCK_TIME_NONE;
+    if (g_atomic_int_get(&stream->state) == GST_AUDIO_RING_BUFFER_STATE_PAUSED) {
+      clock.resumed_ = kPaused;
+      return GST_CLOCK_TIME_NONE;
+    }
+    const gint64 now = g_get_monotonic_time();
+    gint64 resumed = kPaused;
+    if (clock.resumed_.compare_exchange_strong(resumed, now)) return GST_CLOCK_TIME_NONE;
+    if (now - resumed < kMoment) return GST_CLOCK_TIME_NONE;
+    return gst_audio_clock_get_time(clock.own_.get());
+  }
+
+  static void Free(gpointer self) { delete static_cast<SinkClock*>(self); }
+
+  const GstAudioBaseSink* sink_;
+  std::unique_ptr<GstAudioClock, FreeWith<gst_object_unref>> own_;
+  std::atomic<gint64> resumed_{0};
+};
+
 /// A name of its own for each sink: sinks of one name share a connection, and with it the end of a
 /// server, which would keep new ones from the next server.
 std::string MakeClientName() {
@@ -179,6 +225,7 @@ ElementPtr MakePulseSink() {
   ElementPtr sink = MakeElement("pulsesink");
   if (sink == nullptr) return nullptr;
   g_object_set(sink.get(), "client-name", MakeClientName().c_str(), nullptr);
+  SinkClock::Install(GST_AUDIO_BASE_SINK(sink.get()));
   SetStreamProperties(sink.get(), GetPlayerRole());
   Observe(sink.get(), "sink", GST_PAD_PROBE_TYPE_BUFFER, FollowRole, sink.get());
   return sink;

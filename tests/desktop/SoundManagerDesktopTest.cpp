@@ -436,11 +436,16 @@ TEST_F(SoundManagerDesktop, SessionDecidesTheRoleOfPlayersStreams) {
   EXPECT_EQ(listener.Take(), "code 6");
 }
 
+void ExpectPlays(Tizen::Media::Player& player) {
+  EXPECT_EQ(player.OpenFile(Film().c_str()), E_SUCCESS);
+  EXPECT_EQ(player.Play(), E_SUCCESS);
+  EXPECT_TRUE(ComesTrue([&] { return player.GetPosition() > 0; }));
+}
+
 TEST_F(SoundManagerDesktop, PlayerPlaysOnThoughTheServerWasSlowToPauseIt) {
   Tizen::Media::Player player;
   ASSERT_EQ(player.Construct(), E_SUCCESS);
-  ASSERT_EQ(player.OpenFile(Film().c_str()), E_SUCCESS);
-  ASSERT_EQ(player.Play(), E_SUCCESS);
+  ExpectPlays(player);
   for (long position = 200; position <= 2000; position += 200) {
     ASSERT_TRUE(ComesTrue([&] { return player.GetPosition() > position; })) << position;
     server.Signal(SIGSTOP);
@@ -510,10 +515,7 @@ TEST(SoundServerFaults, PlayersFailWithTheServerAndCanBeOpenedOnTheNextWhileOthe
   ExpectSoon(E_SYSTEM,
              [&] { return Tizen::Media::_PlayerImpl::GetInstance(&players[1])->SeekTo(0, false); });
   server.Start();
-  for (auto* player : {&players[1], &players[2]}) {  // reopened and new
-    ASSERT_EQ(player->OpenFile(Film().c_str()), E_SUCCESS);
-    EXPECT_EQ(player->Play(), E_SUCCESS);
-  }
+  for (auto* player : {&players[1], &players[2]}) ExpectPlays(*player);  // reopened and new
   EXPECT_TRUE(ComesTrue([] { return ListStreams(RoleLine("music")).size() == 2; }));
 }
 
@@ -664,11 +666,6 @@ TEST(SoundServerFaults, HundredDeathsOfTheServerLeaveNothingBehind) {
   NativeListener listener(NativeListener::kAll);
   sound_call_session_h call = nullptr;
   ASSERT_EQ(sound_manager_call_session_create(1, &call), 0);
-  const auto expectPlays = [](Tizen::Media::Player& player) {
-    EXPECT_EQ(player.OpenFile(Film().c_str()), E_SUCCESS);
-    EXPECT_EQ(player.Play(), E_SUCCESS);
-    EXPECT_TRUE(ComesTrue([&] { return player.GetPosition() > 0; }));
-  };
   Footprint before = {};
   for (int i = 0; i < kWarmUp + kDeaths; ++i) {
     SCOPED_TRACE(i);
@@ -676,7 +673,7 @@ TEST(SoundServerFaults, HundredDeathsOfTheServerLeaveNothingBehind) {
     Tizen::Media::Player players[2];
     for (auto& player : players) {
       ASSERT_EQ(player.Construct(), E_SUCCESS);
-      expectPlays(player);
+      ExpectPlays(player);
     }
     std::thread user([] {
       while (sound_manager_set_volume(kMedia, rand() % 10) == 0) {
@@ -692,7 +689,7 @@ TEST(SoundServerFaults, HundredDeathsOfTheServerLeaveNothingBehind) {
     ASSERT_EQ(sound_manager_set_muteall(true), 0);
     ASSERT_TRUE(ComesTrue([&] { return listener.Take() == Level(kMedia, 10 + i % 2); }));
     ASSERT_EQ(listener.Take(), "muted");
-    expectPlays(players[0]);
+    ExpectPlays(players[0]);
     ASSERT_LT(std::chrono::steady_clock::now() - begin, std::chrono::seconds(2));
     listener.TakeAll();
   }
